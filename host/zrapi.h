@@ -83,7 +83,8 @@ public:
     // Null when `pos` is out of range.
     ZrField* GetFieldbyPos(int pos) const;
     // Appends a field made by the caller and owns it from then on. A null field is
-    // refused (false).
+    // refused (false); so is any field when memory runs out, which the caller then
+    // still owns.
     bool AppendField(ZrField* field);
 
 private:
@@ -118,6 +119,8 @@ struct OptionValueDef {
     const ZrWChar* description;
 };
 
+// Option callbacks get the browser as `owner`: a `ZrDictBrowser*` converted to
+// `void*`, and `name` the option's key.
 using ZrOptionGetter = BATCHERR (*)(void* owner, ZrString& value, const ZrWChar* name);
 using ZrOptionSetter = BATCHERR (*)(void* owner, const char* value, bool& changed,
                                     const ZrWChar* name);
@@ -147,6 +150,8 @@ public:
     ZrOptionSetter Setter() const { return setter_; }
     ZrOptionWGetter WGetter() const { return wgetter_; }
     ZrOptionWSetter WSetter() const { return wsetter_; }
+    int Group() const { return group_; }
+    long HelpId() const { return helpId_; }
 
 private:
     ZrWString key_;
