@@ -6,6 +6,8 @@
 #include "zrbxmls_export.h"
 #include "zrstring.h"
 
+class ZrXmlSchemaDictTestAccess;
+
 class ZRBXMLS_API ZrXmlSchemaDict : public ZrDictBrowser {
 public:
     explicit ZrXmlSchemaDict(ZrSpoke* spoke);
@@ -26,6 +28,8 @@ public:
     void QualifiedRecords(bool on) { qualifiedRecords = on; }
 
 private:
+    friend class ZrXmlSchemaDictTestAccess;
+
     bool initialised = true;
     bool qualifiedRecords = false;
     ZrWString initError;

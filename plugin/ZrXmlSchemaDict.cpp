@@ -1,0 +1,72 @@
+#include "ZrXmlSchemaDict.h"
+
+#include "ZrXmlSchemaBrowser.h"
+#include "zrglob.h"
+
+#include <new>
+#include <xercesc/util/PlatformUtils.hpp>
+#include <xercesc/util/XMLException.hpp>
+#include <xercesc/util/XMLUni.hpp>
+
+XERCES_CPP_NAMESPACE_USE
+
+ZrXmlSchemaDict::ZrXmlSchemaDict(ZrSpoke* spoke) : ZrDictBrowser(spoke, kBuiltinTypeDefinitions) {
+    // The parser library counts initialisations and is never terminated here: a
+    // host may hold several dictionaries, and browsers initialise it again per read.
+    try {
+        XMLPlatformUtils::Initialize(XMLUni::fgXercescDefaultLocale, nullptr, nullptr, nullptr);
+    } catch (const XMLException& e) {
+        initialised = false;
+        ZrXmlUtils::XMLChToWchar(e.getMessage(), initError, false);
+    }
+    // Gives qualifiedRecords its first value from the option's default.
+    InitOptions();
+}
+
+ZrXmlSchemaDict::ZrXmlSchemaDict(const ZrXmlSchemaDict& other)
+    : ZrDictBrowser(other), initialised(other.initialised),
+      qualifiedRecords(other.qualifiedRecords), initError(other.initError) {}
+
+ZrXmlSchemaDict& ZrXmlSchemaDict::operator=(const ZrXmlSchemaDict& other) {
+    if (this != &other) {
+        ZrDictBrowser::operator=(other);
+        initialised = other.initialised;
+        qualifiedRecords = other.qualifiedRecords;
+        initError = other.initError;
+    }
+    return *this;
+}
+
+ZrXmlSchemaDict::~ZrXmlSchemaDict() = default;
+
+BATCHERR ZrXmlSchemaDict::ReadDictionary(const char* path) {
+    if (!initialised) {
+        ZrGlob::LogMessage(ZR_SEV_ERROR, BE_READ_FAILED,
+                           lgettext(u"ZrXmlSchemaDict: Initialization error: %s"),
+                           initError.c_str());
+        return BE_READ_FAILED;
+    }
+    RecordList().Clear();
+    ZrWString widePath;
+    // No exception may reach the host. The browser catches everything around the
+    // parser itself; what is left is running out of memory while building or
+    // copying records, which fails the read like any other cause.
+    try {
+        widePath.Assign(path, ZR_CSET_DEFAULT, -1);
+        ZrXmlSchemaBrowser browser;
+        if (!browser.ReadSchema(widePath.c_str(), qualifiedRecords))
+            return BE_READ_FAILED;
+        const ZrRecordList& built = browser.Records();
+        for (int i = 0; i < built.Count(); ++i) {
+            if (!RecordList().AddRecord(built[i], -1))
+                throw std::bad_alloc();
+        }
+    } catch (const std::bad_alloc&) {
+        RecordList().Clear();
+        ZrGlob::LogMessage(ZR_SEV_ERROR, BE_NO_MEMORY,
+                           lgettext(u"ZrXmlSchemaDict: Out of memory reading %s"),
+                           widePath.c_str());
+        return BE_READ_FAILED;
+    }
+    return BE_OK;
+}
