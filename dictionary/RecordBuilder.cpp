@@ -1,0 +1,348 @@
+// Record construction: turns the top-level declarations of complex type, and the
+// declarations nested in them, into host records and fields.
+#include "ZrXmlSchemaBrowser.h"
+#include "zrglob.h"
+
+#include <string>
+
+namespace {
+
+// Nested records, groups, element references, base types and simple-type bases
+// together may open this many levels. Real schemas stay far below it; the bound keeps
+// the recursion that follows them well inside an 8 MB stack, sanitizers included.
+constexpr int kMaxBuildDepth = 1000;
+
+// Every read may take this many addField and buildRecord steps, plus a number per
+// component of its model. Group references that fan out, and qualified record names
+// over types shared along many paths, otherwise multiply without bound; an honest
+// schema takes a small multiple of its size.
+constexpr long kBuildStepFloor = 1000000;
+constexpr long kBuildStepsPerComponent = 64;
+
+// Keeps a counter raised for the lifetime of a scope.
+class DepthScope {
+  public:
+    explicit DepthScope(int& depth) : depth_(depth) { ++depth_; }
+
+    DepthScope(const DepthScope&) = delete;
+    DepthScope& operator=(const DepthScope&) = delete;
+
+    ~DepthScope() { --depth_; }
+
+  private:
+    int& depth_;
+};
+
+// Marks a component as being drawn into the record under construction.
+class ExpansionScope {
+  public:
+    ExpansionScope(std::vector<const void*>& stack, const void* component) : stack_(stack) {
+        stack_.push_back(component);
+    }
+
+    ExpansionScope(const ExpansionScope&) = delete;
+    ExpansionScope& operator=(const ExpansionScope&) = delete;
+
+    ~ExpansionScope() { stack_.pop_back(); }
+
+  private:
+    std::vector<const void*>& stack_;
+};
+
+// Starts the expansion guards afresh for a nested record: what the records around it
+// are expanding may recur inside it, since records end that recursion themselves.
+class RecordScope {
+  public:
+    RecordScope(std::vector<const void*>& stack, size_t& floor, const void* type)
+        : stack_(stack), floor_(floor), savedFloor_(floor) {
+        floor_ = stack_.size();
+        stack_.push_back(type);
+    }
+
+    RecordScope(const RecordScope&) = delete;
+    RecordScope& operator=(const RecordScope&) = delete;
+
+    ~RecordScope() {
+        stack_.pop_back();
+        floor_ = savedFloor_;
+    }
+
+  private:
+    std::vector<const void*>& stack_;
+    size_t& floor_;
+    size_t savedFloor_;
+};
+
+ZrWString generatedName(int32_t number) {
+    ZrWString name(u"anon");
+    for (char c : std::to_string(number))
+        name += ZrWChar(c);
+    return name;
+}
+
+} // namespace
+
+ZrRecord* ZrXmlSchemaBrowser::buildRecord(const ElementDef& declaration) {
+    // The first record of a read starts from an empty list with no record open.
+    if (recordWorkList.empty() && records.Count() == 0) {
+        buildSteps = 0;
+        buildStepLimit = 0;
+    }
+    const ZrWString qualified = qualifiedName(declaration.nameNs, declaration.name, false);
+    DepthScope depth(buildDepth);
+    if (nestingTooDeep(qualified) || !takeBuildStep(qualified))
+        return nullptr;
+
+    ZrWString name = recordName(qualified);
+    auto existing = recordsByName.find(name);
+    if (existing != recordsByName.end())
+        return existing->second;
+
+    ZrRecord* record = records.AddRecord(nullptr, -1);
+    if (!record) {
+        ZrGlob::LogMessage(ZR_SEV_ERROR, BE_NO_MEMORY, "Out of memory allocating record");
+        return nullptr;
+    }
+    record->name = name;
+    recordsByName.emplace(std::move(name), record);
+    recordWorkList.push_back(qualified);
+
+    bool built = false;
+    const ComplexTypeDef* type =
+        findComplexType(declaration.typeName.c_str(), declaration.typeNs.c_str());
+    if (!type) {
+        const ZrWString typeText = qualifiedName(declaration.typeNs, declaration.typeName, true);
+        ZrGlob::LogMessage(ZR_SEV_ERROR, 4, "Unable to find complex type %S", typeText.c_str());
+    } else {
+        RecordScope scope(expansionStack, expansionFloor, type);
+        built = addDerivedContent(*type, record->name, record);
+        for (auto it = type->content.begin(); built && it != type->content.end(); ++it)
+            built = addField(*it, record);
+    }
+    // A failed record stays in the list with the fields added so far; the read fails.
+    recordWorkList.pop_back();
+    return built ? record : nullptr;
+}
+
+// Draws in what `type` inherits: the text field of simple content, or the whole base
+// chain's declarations, farthest base first, so a type derived in several steps keeps
+// the fields of every base and not only of the nearest one.
+bool ZrXmlSchemaBrowser::addDerivedContent(const ComplexTypeDef& type, const ZrWString& recordName,
+                                           ZrRecord* record) {
+    if (type.baseName.empty())
+        return true;
+    const ComplexTypeDef* base = findComplexType(type.baseName.c_str(), type.baseNs.c_str());
+    if (type.simpleContent && !(base && !base->isGroup && base->simpleContent)) {
+        // Text typed by a simple type. A base that is a complex type without simple
+        // content cannot type text, and fails the field in lookupType.
+        return addSimpleContentField(type, recordName, record);
+    }
+    // What remains: complex content drawing in its base, or simple content extending
+    // a type that has simple content itself, whose text field and attributes come
+    // first, down to the simple type at the far end of the chain.
+    if (!base) {
+        // A base that is no complex type is the simple type of the record's own text.
+        if (type.baseName.view() == u"anyType")
+            return true;
+        return addTextField(recordName, type.baseName, type.baseNs, record);
+    }
+    if (isExpanding(base)) {
+        ZrGlob::LogMessage(ZR_SEV_ERROR, 0, "Circular base type chain at complex type %S",
+                           base->name.c_str());
+        return false;
+    }
+    DepthScope depth(buildDepth);
+    if (nestingTooDeep(base->name))
+        return false;
+    ExpansionScope expanding(expansionStack, base);
+    bool added = addDerivedContent(*base, recordName, record);
+    for (auto it = base->content.begin(); added && it != base->content.end(); ++it)
+        added = addField(*it, record);
+    return added;
+}
+
+// The text of a simple-content type becomes one field named after the record, typed
+// by a temporary simple type: the complex type's own base and facets under a fresh
+// generated name, removed again once the field has its type.
+bool ZrXmlSchemaBrowser::addSimpleContentField(const ComplexTypeDef& type,
+                                               const ZrWString& recordName, ZrRecord* record) {
+    SimpleTypeDef text(static_cast<const SimpleTypeDef&>(type));
+    text.name = generatedName(anonCounter++);
+    simpleTypes.push_back(std::move(text));
+    const ZrWString typeName = simpleTypes.back().name;
+    if (!addTextField(recordName, typeName, ZrWString(), record))
+        return false; // the temporary type stays; the read fails anyway
+    simpleTypes.pop_back();
+    return true;
+}
+
+bool ZrXmlSchemaBrowser::addTextField(const ZrWString& recordName, const ZrWString& typeName,
+                                      const ZrWString& typeNs, ZrRecord* record) {
+    ElementDef text;
+    text.name = recordName;
+    text.typeName = typeName;
+    text.typeNs = typeNs;
+    return addField(text, record);
+}
+
+bool ZrXmlSchemaBrowser::addField(const ElementDef& declaration, ZrRecord* record) {
+    if (!takeBuildStep(record->name))
+        return false;
+    if (!declaration.refName.empty())
+        return addReference(declaration, record);
+    if (!declaration.groupName.empty())
+        return addGroup(declaration, record);
+
+    if (findComplexType(declaration.typeName.c_str(), declaration.typeNs.c_str())) {
+        const ZrRecord* nested = buildRecord(declaration);
+        if (!nested)
+            return false;
+        // A record met again (a recursive type, or a name shared under unqualified
+        // record names) gets one field in its parent, not one per occurrence.
+        if (!record->GetFieldbyName(nested->name))
+            record->NewField(recordType, nested->name);
+        return true;
+    }
+    return addSimpleField(declaration, record);
+}
+
+// The global declaration stands in for the reference entirely, its attribute and
+// nullable flags included.
+bool ZrXmlSchemaBrowser::addReference(const ElementDef& reference, ZrRecord* record) {
+    const ElementDef* target =
+        globalElements.findExact(reference.refName.view(), reference.refNs.view());
+    if (!target) {
+        ZrGlob::LogMessage(ZR_SEV_ERROR, 0, "Failed to look up ref to %S:%S",
+                           reference.refNs.c_str(), reference.refName.c_str());
+        return false;
+    }
+    if (isExpanding(target)) {
+        ZrGlob::LogMessage(ZR_SEV_ERROR, 0, "Circular reference to element %S:%S",
+                           reference.refNs.c_str(), reference.refName.c_str());
+        return false;
+    }
+    DepthScope depth(buildDepth);
+    if (nestingTooDeep(reference.refName))
+        return false;
+    ExpansionScope expanding(expansionStack, target);
+    return addField(*target, record);
+}
+
+bool ZrXmlSchemaBrowser::addGroup(const ElementDef& reference, ZrRecord* record) {
+    const ComplexTypeDef* group =
+        findComplexType(reference.groupName.c_str(), reference.groupNs.c_str());
+    if (!group) {
+        ZrGlob::LogMessage(ZR_SEV_ERROR, 4, "Unable to find group %S", reference.groupName.c_str());
+        return false;
+    }
+    if (isExpanding(group)) {
+        ZrGlob::LogMessage(ZR_SEV_ERROR, 0, "Circular reference to group %S",
+                           reference.groupName.c_str());
+        return false;
+    }
+    DepthScope depth(buildDepth);
+    if (nestingTooDeep(reference.groupName))
+        return false;
+    ExpansionScope expanding(expansionStack, group);
+    for (const ElementDef& entry : group->content) {
+        if (!addField(entry, record))
+            return false;
+    }
+    return true;
+}
+
+bool ZrXmlSchemaBrowser::addSimpleField(const ElementDef& declaration, ZrRecord* record) {
+    const ZrWString field = qualifiedName(declaration.nameNs, declaration.name, false);
+    // The type name goes through its text form and back, as a prefixed name would.
+    const ZrWString typeText = qualifiedName(declaration.typeNs, declaration.typeName, true);
+    ZrWString local;
+    ZrWString ns;
+    parseName(typeText.c_str(), true, local, ns);
+    if (local.empty())
+        local = u"string";
+
+    ZrDType type;
+    if (!lookupType(local.c_str(), ns.c_str(), type)) {
+        ZrGlob::LogMessage(ZR_SEV_ERROR, 0,
+                           lgettext(u"Lookup of type '%s' (ns '%s') failed for field '%s'"),
+                           local.c_str(), ns.c_str(), field.c_str());
+        return false;
+    }
+    if (declaration.isAttribute) {
+        // Only usage and alias change; a type without an attribute variant keeps its alias.
+        const short usage = short(type.Usage() + 256);
+        type.Usage(usage);
+        if (const ZrDType* variant = TypeByUsage(usage))
+            type.Alias(variant->Alias());
+    }
+    type.Nulls(declaration.nullable);
+    // The host's NewField fails only by throwing bad_alloc, so its result needs no test.
+    record->NewField(type, field);
+    return true;
+}
+
+ZrWString ZrXmlSchemaBrowser::qualifiedName(const ZrWString& ns, const ZrWString& local,
+                                            bool useTargetPrefix) {
+    const XMLCh* prefix = ReverseNamespace(ns.c_str(), useTargetPrefix);
+    if (!prefix || !*prefix)
+        return local;
+    ZrWString name(prefix);
+    name += u':';
+    name += local;
+    return name;
+}
+
+// With qualified record names, a record nested two or more levels deep carries the
+// path of the records around it, the outermost left out: [item!detail]note. A name
+// already on that path stands alone, which ends the path of a recursive type.
+ZrWString ZrXmlSchemaBrowser::recordName(const ZrWString& qualified) const {
+    if (!qualifiedRecords || recordWorkList.size() <= 1)
+        return qualified;
+    ZrWString name(u"[");
+    for (size_t i = 1; i < recordWorkList.size(); ++i) {
+        const ZrWString& entry = recordWorkList[i];
+        if (entry == qualified)
+            return qualified;
+        if (name.length() > 1)
+            name += u'!';
+        name += entry;
+    }
+    name += u']';
+    name += qualified;
+    return name;
+}
+
+bool ZrXmlSchemaBrowser::isExpanding(const void* component) const {
+    for (size_t i = expansionFloor; i < expansionStack.size(); ++i) {
+        if (expansionStack[i] == component)
+            return true;
+    }
+    return false;
+}
+
+bool ZrXmlSchemaBrowser::nestingTooDeep(const ZrWString& where) {
+    if (buildDepth <= kMaxBuildDepth)
+        return false;
+    ZrGlob::LogMessage(ZR_SEV_ERROR, 0, "Schema nesting deeper than %d levels at %S",
+                       kMaxBuildDepth, where.c_str());
+    return true;
+}
+
+bool ZrXmlSchemaBrowser::takeBuildStep(const ZrWString& where) {
+    if (buildStepLimit == 0)
+        buildStepLimit = buildStepBudget();
+    if (++buildSteps <= buildStepLimit)
+        return true;
+    // Said once: the failure unwinds the whole build without taking further steps.
+    if (buildSteps == buildStepLimit + 1)
+        ZrGlob::LogMessage(ZR_SEV_ERROR, 0, "Schema expands beyond %ld record-building steps at %S",
+                           buildStepLimit, where.c_str());
+    return false;
+}
+
+long ZrXmlSchemaBrowser::buildStepBudget() const {
+    long components = long(globalElements.size() + simpleTypes.size());
+    for (const ComplexTypeDef& type : complexTypes)
+        components += 1 + long(type.content.size());
+    return kBuildStepFloor + kBuildStepsPerComponent * components;
+}
