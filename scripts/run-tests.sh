@@ -1,0 +1,20 @@
+#!/usr/bin/env bash
+# Installs what is missing, then builds and runs the whole test suite twice: once
+# with warnings as errors, once under the address and undefined-behaviour
+# sanitizers. Stops at the first failure.
+set -euo pipefail
+source "$(dirname "${BASH_SOURCE[0]}")/setup.sh"
+
+zr_install_packages
+
+werror="$ZR_ROOT/build/werror"
+zr_build "$werror" -DCMAKE_BUILD_TYPE=RelWithDebInfo -DZR_WERROR=ON
+echo "== ctest $werror"
+ctest --test-dir "$werror" --output-on-failure -j "$ZR_JOBS"
+
+sanitize="$ZR_ROOT/build/sanitize"
+zr_build "$sanitize" -DCMAKE_BUILD_TYPE=Debug -DZR_WERROR=ON -DZR_SANITIZE=ON
+echo "== ctest $sanitize (address, undefined)"
+ASAN_OPTIONS=detect_leaks=1 \
+UBSAN_OPTIONS=halt_on_error=1:print_stacktrace=1 \
+    ctest --test-dir "$sanitize" --output-on-failure -j "$ZR_JOBS"
