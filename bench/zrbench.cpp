@@ -1,0 +1,684 @@
+// zrbench: how a schema read compares with the XML parser's own pass over the same
+// documents, how it grows with the schema, and how much memory it needs.
+//
+// For each generated size (and each schema named with --schema) it measures in one
+// process: the floor, a SAX parser configured exactly as a read configures it, with
+// a handler that does nothing but follow includes; the read, ZrXmlSchemaDict's
+// whole ReadDictionary including the copy of the records into the dictionary; and
+// the peak of live heap bytes during one read, counted by the allocation functions
+// this program replaces (the parser allocates through them too).
+#include "ParserConfig.h"
+#include "SchemaGenerator.h"
+#include "ZrXmlSchemaDict.h"
+#include "zrglob.h"
+
+#include <algorithm>
+#include <atomic>
+#include <benchmark/benchmark.h>
+#include <chrono>
+#include <cstdio>
+#include <cstdlib>
+#include <cstring>
+#include <deque>
+#include <filesystem>
+#include <malloc.h>
+#include <map>
+#include <new>
+#include <optional>
+#include <set>
+#include <stdexcept>
+#include <string>
+#include <sys/resource.h>
+#include <system_error>
+#include <time.h>
+#include <unistd.h>
+#include <vector>
+#include <xercesc/parsers/SAXParser.hpp>
+#include <xercesc/sax/HandlerBase.hpp>
+#include <xercesc/util/PlatformUtils.hpp>
+#include <xercesc/util/XMLString.hpp>
+
+// --- heap accounting ----------------------------------------------------------------
+//
+// Sizes are what the C library actually reserved (malloc_usable_size), counted on
+// both allocation and release, so the figure is the heap the read really holds.
+// Counting is switched on only around the one read whose peak is reported, so the
+// timed runs pay nothing for it.
+
+namespace {
+
+std::atomic<bool> heapCounting{false};
+std::atomic<long long> heapLive{0};
+std::atomic<long long> heapPeak{0};
+
+void countAllocation(void* p) {
+    const auto size = static_cast<long long>(malloc_usable_size(p));
+    const long long live = heapLive.fetch_add(size, std::memory_order_relaxed) + size;
+    long long peak = heapPeak.load(std::memory_order_relaxed);
+    while (live > peak && !heapPeak.compare_exchange_weak(peak, live, std::memory_order_relaxed)) {
+    }
+}
+
+void* allocate(std::size_t size, std::size_t alignment) {
+    void* p = nullptr;
+    if (alignment <= alignof(std::max_align_t))
+        p = std::malloc(size ? size : 1);
+    else if (posix_memalign(&p, alignment, size ? size : 1) != 0)
+        p = nullptr;
+    if (p && heapCounting.load(std::memory_order_relaxed))
+        countAllocation(p);
+    return p;
+}
+
+void* allocateOrThrow(std::size_t size, std::size_t alignment) {
+    void* p = allocate(size, alignment);
+    if (!p)
+        throw std::bad_alloc();
+    return p;
+}
+
+void release(void* p) noexcept {
+    if (!p)
+        return;
+    if (heapCounting.load(std::memory_order_relaxed))
+        heapLive.fetch_sub(static_cast<long long>(malloc_usable_size(p)),
+                           std::memory_order_relaxed);
+    std::free(p);
+}
+
+constexpr std::size_t kPlain = alignof(std::max_align_t);
+
+} // namespace
+
+void* operator new(std::size_t n) { return allocateOrThrow(n, kPlain); }
+
+void* operator new[](std::size_t n) { return allocateOrThrow(n, kPlain); }
+
+void* operator new(std::size_t n, const std::nothrow_t&) noexcept { return allocate(n, kPlain); }
+
+void* operator new[](std::size_t n, const std::nothrow_t&) noexcept { return allocate(n, kPlain); }
+
+void* operator new(std::size_t n, std::align_val_t a) {
+    return allocateOrThrow(n, static_cast<std::size_t>(a));
+}
+
+void* operator new[](std::size_t n, std::align_val_t a) {
+    return allocateOrThrow(n, static_cast<std::size_t>(a));
+}
+
+void* operator new(std::size_t n, std::align_val_t a, const std::nothrow_t&) noexcept {
+    return allocate(n, static_cast<std::size_t>(a));
+}
+
+void* operator new[](std::size_t n, std::align_val_t a, const std::nothrow_t&) noexcept {
+    return allocate(n, static_cast<std::size_t>(a));
+}
+
+void operator delete(void* p) noexcept { release(p); }
+
+void operator delete[](void* p) noexcept { release(p); }
+
+void operator delete(void* p, std::size_t) noexcept { release(p); }
+
+void operator delete[](void* p, std::size_t) noexcept { release(p); }
+
+void operator delete(void* p, const std::nothrow_t&) noexcept { release(p); }
+
+void operator delete[](void* p, const std::nothrow_t&) noexcept { release(p); }
+
+void operator delete(void* p, std::align_val_t) noexcept { release(p); }
+
+void operator delete[](void* p, std::align_val_t) noexcept { release(p); }
+
+void operator delete(void* p, std::size_t, std::align_val_t) noexcept { release(p); }
+
+void operator delete[](void* p, std::size_t, std::align_val_t) noexcept { release(p); }
+
+void operator delete(void* p, std::align_val_t, const std::nothrow_t&) noexcept { release(p); }
+
+void operator delete[](void* p, std::align_val_t, const std::nothrow_t&) noexcept { release(p); }
+
+namespace {
+
+using namespace xercesc;
+namespace fs = std::filesystem;
+
+constexpr double kMB = 1024.0 * 1024.0;
+
+std::string utf8(const XMLCh* text) {
+    char* s = XMLString::transcode(text);
+    std::string out = s ? s : "";
+    XMLString::release(&s);
+    return out;
+}
+
+// --- the floor ----------------------------------------------------------------------
+
+// True for a directory the reader treats as absolute: a leading slash or backslash,
+// or a drive letter and colon.
+bool absoluteDirectory(const std::string& dir) {
+    return !dir.empty() && (dir[0] == '/' || dir[0] == '\\' || (dir.size() > 1 && dir[1] == ':'));
+}
+
+std::string directoryOf(const std::string& path) {
+    const size_t slash = path.find_last_of("/\\");
+    return slash == std::string::npos ? std::string() : path.substr(0, slash + 1);
+}
+
+// Where the reader looks for an included document: relative locations are taken as
+// a file name in the including document's directory when that is absolute, and as
+// written otherwise.
+std::string includedPath(const std::string& including, const std::string& location) {
+    const std::string dir = directoryOf(including);
+    const std::string locationDir = directoryOf(location);
+    if (!absoluteDirectory(dir) || absoluteDirectory(locationDir) ||
+        location.find("://") != std::string::npos)
+        return location;
+    return dir + location.substr(locationDir.size());
+}
+
+// Does no work but what reading the same documents needs: noting "include" elements.
+class FloorHandler : public HandlerBase {
+  public:
+    void startElement(const XMLCh* name, AttributeList& attrs) override {
+        const XMLCh* local = name;
+        for (const XMLCh* p = name; *p; ++p)
+            if (*p == u':')
+                local = p + 1;
+        if (!XMLString::equals(local, u"include"))
+            return;
+        if (const XMLCh* location = attrs.getValue(u"schemaLocation"))
+            includes.push_back(utf8(location));
+    }
+
+    void error(const SAXParseException& e) override { fail(e); }
+
+    void fatalError(const SAXParseException& e) override { fail(e); }
+
+    std::vector<std::string> includes;
+    std::string firstError;
+
+  private:
+    void fail(const SAXParseException& e) {
+        if (firstError.empty())
+            firstError = utf8(e.getSystemId()) + ": " + utf8(e.getMessage());
+    }
+};
+
+// Parses `mainPath` and every document it includes, once each, in the reader's
+// order. Returns the documents parsed; throws when one of them fails.
+std::vector<std::string> runFloor(const std::string& mainPath) {
+    SAXParser parser(nullptr, XMLPlatformUtils::fgMemoryManager);
+    configureSchemaParser(parser);
+    FloorHandler handler;
+    parser.setDocumentHandler(&handler);
+    parser.setErrorHandler(&handler);
+
+    std::vector<std::string> parsed;
+    std::set<std::string> queued{mainPath};
+    std::deque<std::string> queue{mainPath};
+    while (!queue.empty()) {
+        const std::string path = queue.front();
+        queue.pop_front();
+        handler.includes.clear();
+        parser.parse(path.c_str());
+        if (!handler.firstError.empty())
+            throw std::runtime_error("floor parse failed: " + handler.firstError);
+        parsed.push_back(path);
+        for (const auto& location : handler.includes) {
+            std::string included = includedPath(path, location);
+            if (queued.insert(included).second)
+                queue.push_back(std::move(included));
+        }
+    }
+    return parsed;
+}
+
+// --- the read -----------------------------------------------------------------------
+
+// Collects what a read logs instead of letting it reach stderr.
+class MessageSink {
+  public:
+    MessageSink() {
+        previous_ = ZrGlob::SetLogSink([this](int severity, int code, const std::u16string& text) {
+            ++count;
+            if (first.size() < 5)
+                first.push_back(std::to_string(severity) + " " + std::to_string(code) + " " +
+                                zrUtf16ToUtf8(text));
+        });
+    }
+
+    MessageSink(const MessageSink&) = delete;
+    MessageSink& operator=(const MessageSink&) = delete;
+
+    ~MessageSink() { ZrGlob::SetLogSink(previous_); }
+
+    long count = 0;
+    std::vector<std::string> first;
+
+  private:
+    ZrLogSink previous_;
+};
+
+struct ReadOutcome {
+    int status = 0;
+    int records = 0;
+    long messages = 0;
+    std::vector<std::string> firstMessages;
+    long long peakBytes = 0;     // most live heap during the read, above its start
+    long long retainedBytes = 0; // live heap left by the read: the dictionary's records
+};
+
+ReadOutcome measuredRead(const std::string& mainPath, bool qualified) {
+    ReadOutcome out;
+    MessageSink sink;
+    ZrXmlSchemaDict dict(nullptr);
+    dict.QualifiedRecords(qualified);
+    heapLive.store(0);
+    heapPeak.store(0);
+    heapCounting.store(true);
+    out.status = dict.ReadDictionary(mainPath.c_str());
+    heapCounting.store(false);
+    out.peakBytes = heapPeak.load();
+    out.retainedBytes = heapLive.load();
+    out.records = dict.RecordList().Count();
+    out.messages = sink.count;
+    out.firstMessages = sink.first;
+    return out;
+}
+
+// --- one schema set -------------------------------------------------------------------
+
+struct SetResult {
+    std::string label;
+    long size = 0; // generated complex types; 0 for a schema given by the user
+    std::vector<std::string> documents;
+    uint64_t textBytes = 0;
+    ReadOutcome read;
+    double floorSeconds = 0;
+    double readSeconds = 0;
+    double maxRssMB = 0;
+    bool timed = false;
+};
+
+std::map<std::string, double> minimumSeconds; // benchmark name -> fastest repetition
+
+// The clock of the timed runs. The calling thread's CPU time by default: both sides
+// are single-threaded and read files the page cache already holds, and on a shared
+// machine CPU time is far steadier than elapsed time, which counts the time other
+// processes hold the cores.
+bool wallClock = false;
+
+double now() {
+    if (wallClock)
+        return std::chrono::duration<double>(std::chrono::steady_clock::now().time_since_epoch())
+            .count();
+    timespec ts{};
+    clock_gettime(CLOCK_THREAD_CPUTIME_ID, &ts);
+    return static_cast<double>(ts.tv_sec) + static_cast<double>(ts.tv_nsec) * 1e-9;
+}
+
+// Echoes the library's own report and keeps the fastest repetition of each benchmark.
+class CollectingReporter : public benchmark::ConsoleReporter {
+  public:
+    CollectingReporter() : ConsoleReporter(isatty(fileno(stdout)) ? OO_ColorTabular : OO_Tabular) {}
+
+    // The machine description once, not before every set.
+    bool ReportContext(const Context& context) override {
+        if (contextShown_)
+            return true;
+        contextShown_ = true;
+        return ConsoleReporter::ReportContext(context);
+    }
+
+    void ReportRuns(const std::vector<Run>& runs) override {
+        ConsoleReporter::ReportRuns(runs);
+        for (const Run& run : runs) {
+            if (run.run_type == Run::RT_Aggregate && run.aggregate_name == "min" &&
+                !run.error_occurred)
+                minimumSeconds[run.run_name.function_name] =
+                    run.GetAdjustedRealTime() / 1e3; // the unit is milliseconds
+        }
+    }
+
+  private:
+    bool contextShown_ = false;
+};
+
+double fastest(const std::vector<double>& values) {
+    return values.empty() ? 0.0 : *std::min_element(values.begin(), values.end());
+}
+
+int defaultRepetitions(uint64_t textBytes) {
+    if (textBytes < 4 * 1024 * 1024)
+        return 9;
+    if (textBytes < 40 * 1024 * 1024)
+        return 5;
+    return 3;
+}
+
+void timeSet(SetResult& set, bool qualified, int repetitions, CollectingReporter& reporter) {
+    const std::string floorName = "floor/" + set.label;
+    const std::string readName = "read/" + set.label;
+    const std::string mainPath = set.documents.front();
+    const int reps = repetitions > 0 ? repetitions : defaultRepetitions(set.textBytes);
+    auto configure = [reps](benchmark::internal::Benchmark* b) {
+        b->UseManualTime()
+            ->Unit(benchmark::kMillisecond)
+            ->Iterations(1)
+            ->Repetitions(reps)
+            ->ComputeStatistics("min", fastest)
+            ->DisplayAggregatesOnly(true);
+    };
+    configure(benchmark::RegisterBenchmark(floorName.c_str(), [mainPath](benchmark::State& state) {
+        for (auto _ : state) {
+            const double start = now();
+            runFloor(mainPath);
+            state.SetIterationTime(now() - start);
+        }
+    }));
+    configure(benchmark::RegisterBenchmark(
+        readName.c_str(), [mainPath, qualified](benchmark::State& state) {
+            MessageSink sink;
+            for (auto _ : state) {
+                // A fresh dictionary each time, built outside the timing: the read is
+                // ReadDictionary alone, from an empty record list.
+                ZrXmlSchemaDict dict(nullptr);
+                dict.QualifiedRecords(qualified);
+                const double start = now();
+                const BATCHERR status = dict.ReadDictionary(mainPath.c_str());
+                state.SetIterationTime(now() - start);
+                if (status != BE_OK)
+                    state.SkipWithError("ReadDictionary failed");
+            }
+        }));
+    benchmark::RunSpecifiedBenchmarks(&reporter);
+    benchmark::ClearRegisteredBenchmarks();
+    set.timed = minimumSeconds.count(floorName) && minimumSeconds.count(readName);
+    if (set.timed) {
+        set.floorSeconds = minimumSeconds[floorName];
+        set.readSeconds = minimumSeconds[readName];
+    }
+}
+
+double maxRssMB() {
+    rusage usage{};
+    getrusage(RUSAGE_SELF, &usage);
+    return static_cast<double>(usage.ru_maxrss) * 1024.0 / kMB; // ru_maxrss is in KiB
+}
+
+// Floor once (it also finds the documents), one counted read, then the timings.
+// False when the set cannot be read.
+bool measureSet(SetResult& set, const std::string& mainPath, bool qualified, bool timing,
+                int repetitions, CollectingReporter& reporter) {
+    set.documents = runFloor(mainPath);
+    for (const auto& doc : set.documents)
+        set.textBytes += fs::file_size(doc);
+    set.read = measuredRead(mainPath, qualified);
+    if (set.read.status != BE_OK || set.read.messages != 0) {
+        std::fprintf(stderr, "%s: ReadDictionary returned %d with %ld message(s)\n",
+                     set.label.c_str(), set.read.status, set.read.messages);
+        for (const auto& m : set.read.firstMessages)
+            std::fprintf(stderr, "  %s\n", m.c_str());
+    }
+    if (set.read.status != BE_OK)
+        return false;
+    if (timing)
+        timeSet(set, qualified, repetitions, reporter);
+    set.maxRssMB = maxRssMB();
+    return true;
+}
+
+// --- report ---------------------------------------------------------------------------
+
+void printTable(const std::vector<SetResult>& sets) {
+    int width = 8;
+    for (const auto& s : sets)
+        width = std::max(width, static_cast<int>(s.label.size()));
+    std::printf("\ntimes: fastest of the repetitions, %s\n",
+                wallClock ? "elapsed time" : "CPU time of the reading thread");
+    std::printf("%-*s %9s %5s %10s %10s %6s %9s %9s %11s %8s %9s\n", width, "set", "text MB",
+                "docs", "floor ms", "read ms", "ratio", "peak MB", "peak/text", "retained MB",
+                "records", "maxrss MB");
+    for (const auto& s : sets) {
+        const double text = static_cast<double>(s.textBytes);
+        const double peak = static_cast<double>(s.read.peakBytes);
+        std::printf("%-*s %9.2f %5zu ", width, s.label.c_str(), text / kMB, s.documents.size());
+        if (s.timed)
+            std::printf("%10.2f %10.2f %6.2f ", s.floorSeconds * 1e3, s.readSeconds * 1e3,
+                        s.readSeconds / s.floorSeconds);
+        else
+            std::printf("%10s %10s %6s ", "-", "-", "-");
+        std::printf("%9.1f %9.2f %11.1f %8d %9.1f\n", peak / kMB, peak / text,
+                    static_cast<double>(s.read.retainedBytes) / kMB, s.read.records, s.maxRssMB);
+    }
+
+    // The targets: read within 1.25 x the floor, linear growth from 10,000 to
+    // 100,000 complex types (at most 11 x), peak at most 8 x the text at 100,000.
+    const SetResult* at10k = nullptr;
+    const SetResult* at100k = nullptr;
+    for (const auto& s : sets) {
+        if (s.size == 10000 && s.timed)
+            at10k = &s;
+        if (s.size == 100000)
+            at100k = &s;
+    }
+    std::printf("\n");
+    for (const auto& s : sets)
+        if (s.timed && s.size > 0)
+            std::printf("target read/floor <= 1.25 at %-7ld %6.2f  %s\n", s.size,
+                        s.readSeconds / s.floorSeconds,
+                        s.readSeconds <= 1.25 * s.floorSeconds ? "met" : "MISSED");
+    if (at10k && at100k && at100k->timed) {
+        const double growth = at100k->readSeconds / at10k->readSeconds;
+        std::printf("growth read(100000)/read(10000)      %6.2f  %s\n", growth,
+                    growth <= 11.0 ? "met" : "MISSED");
+    }
+    if (at100k) {
+        const double ratio =
+            static_cast<double>(at100k->read.peakBytes) / static_cast<double>(at100k->textBytes);
+        std::printf("target peak/text <= 8 at 100000      %6.2f  %s\n", ratio,
+                    ratio <= 8.0 ? "met" : "MISSED");
+    }
+}
+
+// --- command line ---------------------------------------------------------------------
+
+struct Options {
+    std::vector<long> sizes;
+    std::vector<std::string> schemas;
+    std::string workDir;
+    bool keep = false;
+    bool qualified = false;
+    bool check = false;
+    bool wall = false;
+    int repetitions = 0;
+};
+
+int usage(std::FILE* out = stderr) {
+    std::fprintf(
+        out, "usage: zrbench [--sizes N[,N...]] [--schema FILE]... [--work-dir DIR] [--keep]\n"
+             "               [--qualified] [--repetitions N] [--wall] [--check] [--benchmark_...]\n"
+             "  --sizes N,...      generated sets to measure (default 1000,10000,100000;\n"
+             "                     none when only --schema is given)\n"
+             "  --schema FILE      also measure this schema and what it includes (repeatable)\n"
+             "  --work-dir DIR     generate into DIR instead of a temporary folder\n"
+             "  --keep             keep the generated sets\n"
+             "  --qualified        read with QualifiedRecordNames on\n"
+             "  --repetitions N    timed runs per measurement; the fastest counts\n"
+             "                     (default 9, 5 or 3 by size)\n"
+             "  --wall             time by the elapsed clock instead of the reading thread's\n"
+             "                     CPU time\n"
+             "  --check            no timing: every set must read with status 0, no message\n"
+             "                     and at least one record\n"
+             "Google Benchmark's own --benchmark_... flags are passed on.\n");
+    return 2;
+}
+
+std::optional<Options> parseOptions(int argc, char** argv) {
+    Options o;
+    bool sizesGiven = false;
+    for (int i = 1; i < argc; ++i) {
+        const std::string arg = argv[i];
+        auto value = [&]() -> std::optional<std::string> {
+            if (i + 1 >= argc)
+                return std::nullopt;
+            return std::string(argv[++i]);
+        };
+        if (arg == "--sizes") {
+            auto v = value();
+            if (!v)
+                return std::nullopt;
+            sizesGiven = true;
+            size_t pos = 0;
+            while (pos <= v->size()) {
+                const size_t comma = std::min(v->find(',', pos), v->size());
+                char* end = nullptr;
+                const std::string item = v->substr(pos, comma - pos);
+                const long n = std::strtol(item.c_str(), &end, 10);
+                if (item.empty() || *end != '\0' || n < 1)
+                    return std::nullopt;
+                o.sizes.push_back(n);
+                pos = comma + 1;
+            }
+        } else if (arg == "--schema") {
+            auto v = value();
+            if (!v)
+                return std::nullopt;
+            o.schemas.push_back(*v);
+        } else if (arg == "--work-dir") {
+            auto v = value();
+            if (!v)
+                return std::nullopt;
+            o.workDir = *v;
+        } else if (arg == "--repetitions") {
+            auto v = value();
+            if (!v || (o.repetitions = std::atoi(v->c_str())) < 1)
+                return std::nullopt;
+        } else if (arg == "--keep") {
+            o.keep = true;
+        } else if (arg == "--qualified") {
+            o.qualified = true;
+        } else if (arg == "--check") {
+            o.check = true;
+        } else if (arg == "--wall") {
+            o.wall = true;
+        } else {
+            return std::nullopt;
+        }
+    }
+    if (!sizesGiven && o.schemas.empty())
+        o.sizes = {1000, 10000, 100000};
+    return o;
+}
+
+// The folder generated sets go to: the one given, or a fresh temporary one that is
+// removed at the end unless --keep.
+class WorkFolder {
+  public:
+    explicit WorkFolder(const Options& o) : keep_(o.keep || !o.workDir.empty()) {
+        if (!o.workDir.empty()) {
+            fs::create_directories(o.workDir);
+            path_ = fs::absolute(o.workDir).string();
+            return;
+        }
+        std::string pattern = (fs::temp_directory_path() / "zrbench-XXXXXX").string();
+        if (!mkdtemp(pattern.data()))
+            throw std::runtime_error("cannot create a temporary folder");
+        path_ = pattern;
+    }
+
+    WorkFolder(const WorkFolder&) = delete;
+    WorkFolder& operator=(const WorkFolder&) = delete;
+
+    ~WorkFolder() {
+        std::error_code ec;
+        if (keep_)
+            std::printf("generated sets kept in %s\n", path_.c_str());
+        else
+            fs::remove_all(path_, ec);
+    }
+
+    const std::string& path() const { return path_; }
+
+  private:
+    bool keep_;
+    std::string path_;
+};
+
+} // namespace
+
+int main(int argc, char** argv) {
+    // Repetitions of the floor and the read alternate in random order, so a burst of
+    // load on the machine does not fall on one side only. A flag given overrides.
+    for (int i = 1; i < argc; ++i) {
+        if (std::strcmp(argv[i], "--help") == 0 || std::strcmp(argv[i], "-h") == 0) {
+            usage(stdout);
+            return 0;
+        }
+    }
+    std::vector<char*> args(argv, argv + argc);
+    bool interleavingGiven = false;
+    for (char* a : args)
+        interleavingGiven |= std::strncmp(a, "--benchmark_enable_random_interleaving", 38) == 0;
+    char interleave[] = "--benchmark_enable_random_interleaving=true";
+    if (!interleavingGiven)
+        args.insert(args.begin() + 1, interleave);
+    int count = static_cast<int>(args.size());
+    benchmark::Initialize(&count, args.data());
+    const std::optional<Options> options = parseOptions(count, args.data());
+    if (!options)
+        return usage();
+    wallClock = options->wall;
+
+    try {
+        XMLPlatformUtils::Initialize();
+        WorkFolder work(*options);
+        CollectingReporter reporter;
+        std::vector<SetResult> results;
+        bool allRead = true;
+
+        for (long size : options->sizes) {
+            const std::string dir = work.path() + "/" + std::to_string(size);
+            fs::create_directories(dir);
+            const auto start = std::chrono::steady_clock::now();
+            const zrgen::GeneratedSet generated = zrgen::generateSchemaSet(size, dir);
+            std::printf(
+                "generated %ld complex types, %.1f MB in %zu documents, in %.1f s\n", size,
+                static_cast<double>(generated.bytes) / kMB, generated.documents.size(),
+                std::chrono::duration<double>(std::chrono::steady_clock::now() - start).count());
+            std::fflush(stdout);
+            SetResult set;
+            set.label = std::to_string(size);
+            set.size = size;
+            const bool ok = measureSet(set, generated.mainPath, options->qualified, !options->check,
+                                       options->repetitions, reporter);
+            if (ok && set.documents.size() != generated.documents.size()) {
+                std::fprintf(stderr, "%s: the floor parsed %zu documents, the set has %zu\n",
+                             set.label.c_str(), set.documents.size(), generated.documents.size());
+                allRead = false;
+            }
+            allRead = allRead && ok && set.read.messages == 0 && set.read.records > 0;
+            results.push_back(std::move(set));
+            if (!options->keep && options->workDir.empty())
+                fs::remove_all(dir);
+        }
+        for (const auto& schema : options->schemas) {
+            SetResult set;
+            set.label = fs::path(schema).filename().string();
+            const bool ok = measureSet(set, schema, options->qualified, !options->check,
+                                       options->repetitions, reporter);
+            allRead = allRead && ok;
+            results.push_back(std::move(set));
+        }
+
+        printTable(results);
+        benchmark::Shutdown();
+        return allRead ? 0 : 1;
+    } catch (const XMLException& e) {
+        std::fprintf(stderr, "zrbench: %s\n", utf8(e.getMessage()).c_str());
+    } catch (const std::exception& e) {
+        std::fprintf(stderr, "zrbench: %s\n", e.what());
+    }
+    return 1;
+}
