@@ -1,0 +1,29 @@
+// Runs the real zrdict binary and captures what it says.
+#pragma once
+
+#include <nlohmann/json.hpp>
+#include <string>
+#include <vector>
+
+using Json = nlohmann::ordered_json;
+
+struct RunResult {
+    int exitStatus = -1; // the exit status, or 128 + the signal that ended the process
+    std::string out;
+    std::string err;
+
+    // stdout parsed as exactly one JSON document; a null document (and a test
+    // failure naming the output) when it is not one.
+    Json json() const;
+};
+
+// Runs zrdict (the built one, or `program`) with `args` in `workDir` (the current
+// directory when empty), with stdin from /dev/null.
+RunResult runZrdict(const std::vector<std::string>& args, const std::string& workDir = {},
+                    const std::string& program = {});
+
+// Locations fixed when the tests were built.
+std::string dataDir();         // tests/data
+std::string examplesDir();     // examples
+std::string pluginPath();      // the built libzrbxmls.so
+std::string utilLibraryPath(); // a shared library without the plug-in's entry points

@@ -1,0 +1,397 @@
+// The command-line contract of zrdict as other programs rely on it: exit statuses,
+// where output goes, and the shape of the JSON documents.
+#include "ZrdictRunner.h"
+
+#include <cstdlib>
+#include <filesystem>
+#include <gtest/gtest.h>
+
+namespace fs = std::filesystem;
+
+namespace {
+
+std::string example() { return examplesDir() + "/purchase-order.xsd"; }
+
+std::string emptySchema() { return dataDir() + "/e2e/empty-schema.xsd"; }
+
+bool contains(const std::string& text, const std::string& part) {
+    return text.find(part) != std::string::npos;
+}
+
+template <class Case> std::string caseName(const ::testing::TestParamInfo<Case>& param) {
+    return param.param.name;
+}
+
+bool startsWith(const std::string& text, const std::string& prefix) {
+    return text.compare(0, prefix.size(), prefix) == 0;
+}
+
+struct StatusCase {
+    const char* name;
+    std::vector<std::string> args;
+    int exitStatus;
+    const char* stderrMentions; // a text stderr must contain, or null
+};
+
+const StatusCase kStatusCases[] = {
+    {"NoCommand", {}, 2, "subcommand"},
+    {"UnknownCommand", {"frobnicate"}, 2, "frobnicate"},
+    {"UnknownFlag", {"read", "--bogus", example()}, 2, "--bogus"},
+    {"UnknownTopLevelFlag", {"--bogus", "types"}, 2, "--bogus"},
+    {"MissingSchema", {"read"}, 2, "SCHEMA"},
+    {"MissingFlattenRecord", {"flatten", example()}, 2, "RECORD"},
+    {"ExtraArgument", {"read", example(), "surplus"}, 2, "surplus"},
+    {"UnknownFormat", {"types", "--format", "yaml"}, 2, "yaml"},
+    {"OptionWithoutValue",
+     {"read", "--option", "QualifiedRecordNames", example()},
+     2,
+     "NAME=VALUE"},
+    {"UnknownOptionName", {"read", "--option", "NoSuchOption=1", example()}, 2, "NoSuchOption"},
+    {"UnknownOptionNameBeforeOptions", {"options", "--option", "Qualified=True"}, 2, "Qualified"},
+    {"UnknownSpoke", {"flatten", "--spoke", "csv", example(), "item"}, 2, "csv"},
+    {"UnknownFlattenRecord", {"flatten", example(), "noSuchRecord"}, 2, "noSuchRecord"},
+    {"MissingPlugin",
+     {"--plugin", "/nonexistent/libzrbxmls.so", "types"},
+     3,
+     "/nonexistent/libzrbxmls.so"},
+    {"MissingPluginAfterCommand",
+     {"types", "--plugin", "/nonexistent/libzrbxmls.so"},
+     3,
+     "/nonexistent/libzrbxmls.so"},
+    {"PluginWithoutEntryPoints", {"types", "--plugin", utilLibraryPath()}, 3, "NewBrowser"},
+    {"Help", {"--help"}, 0, nullptr},
+    {"CommandHelp", {"flatten", "--help"}, 0, nullptr},
+    {"Version", {"--version"}, 0, nullptr},
+    {"Types", {"types"}, 0, nullptr},
+    {"PluginBeforeCommand", {"--plugin", pluginPath(), "types"}, 0, nullptr},
+    {"PluginAfterCommand", {"options", "--plugin", pluginPath()}, 0, nullptr},
+    {"OptionLowerCase", {"options", "--option", "qualifiedrecordnames=true"}, 0, nullptr},
+    {"ReadExample", {"read", example()}, 0, nullptr},
+    {"ReadMissingFile", {"read", "/nonexistent/missing.xsd"}, 19, "fatal 4: Schema: Fatal: "},
+    {"FlattenExample", {"flatten", "--spoke", "text", example(), "item"}, 0, nullptr},
+    {"FlattenMissingFile", {"flatten", "/nonexistent/missing.xsd", "item"}, 19, nullptr},
+};
+
+// Test listings show the row's label rather than its bytes.
+void PrintTo(const StatusCase& c, std::ostream* out) { *out << c.name; }
+
+class ExitStatus : public ::testing::TestWithParam<StatusCase> {};
+
+TEST_P(ExitStatus, MatchesContract) {
+    const StatusCase& c = GetParam();
+    RunResult run = runZrdict(c.args);
+    EXPECT_EQ(run.exitStatus, c.exitStatus) << "stdout:\n" << run.out << "\nstderr:\n" << run.err;
+    if (c.stderrMentions) {
+        EXPECT_TRUE(contains(run.err, c.stderrMentions)) << "stderr:\n" << run.err;
+    }
+    if (c.exitStatus == 0) {
+        EXPECT_EQ(run.err, "");
+    }
+}
+
+INSTANTIATE_TEST_SUITE_P(Zrdict, ExitStatus, ::testing::ValuesIn(kStatusCases),
+                         caseName<StatusCase>);
+
+TEST(Usage, HelpAndVersionGoToStdout) {
+    RunResult help = runZrdict({"--help"});
+    for (const char* command : {"read", "options", "types", "flatten"})
+        EXPECT_TRUE(contains(help.out, command)) << help.out;
+    RunResult commandHelp = runZrdict({"flatten", "--help"});
+    for (const char* part : {"SCHEMA", "RECORD", "--spoke", "--option", "--format", "--plugin"})
+        EXPECT_TRUE(contains(commandHelp.out, part)) << commandHelp.out;
+    RunResult version = runZrdict({"--version"});
+    EXPECT_TRUE(startsWith(version.out, "zrdict ")) << version.out;
+}
+
+// A program that asks for JSON gets one JSON document on stdout and nothing on
+// stderr, whatever went wrong, as long as the plug-in could be loaded.
+struct JsonFailureCase {
+    const char* name;
+    std::vector<std::string> args;
+    int exitStatus;
+};
+
+const JsonFailureCase kJsonFailureCases[] = {
+    {"ReadMissingFile", {"read", "--format", "json", "/nonexistent/missing.xsd"}, 19},
+    {"FlattenMissingFile", {"flatten", "--format", "json", "/nonexistent/missing.xsd", "x"}, 19},
+    {"UnknownOptionName", {"read", "--format", "json", "--option", "Nope=1", example()}, 2},
+    {"UnknownRecord", {"flatten", "--format", "json", example(), "noSuchRecord"}, 2},
+    {"UnknownFlag", {"read", "--format", "json", "--bogus", example()}, 2},
+    {"MissingSchema", {"read", "--format=json"}, 2},
+};
+
+void PrintTo(const JsonFailureCase& c, std::ostream* out) { *out << c.name; }
+
+class JsonFailure : public ::testing::TestWithParam<JsonFailureCase> {};
+
+TEST_P(JsonFailure, PrintsOneDocumentAndNothingOnStderr) {
+    const JsonFailureCase& c = GetParam();
+    RunResult run = runZrdict(c.args);
+    EXPECT_EQ(run.exitStatus, c.exitStatus);
+    EXPECT_EQ(run.err, "");
+    Json doc = run.json();
+    ASSERT_TRUE(doc.is_object());
+    if (c.exitStatus == 2) {
+        ASSERT_TRUE(doc.contains("error"));
+        EXPECT_TRUE(doc["error"].is_string());
+    } else {
+        EXPECT_EQ(doc["status"], c.exitStatus);
+        EXPECT_EQ(doc["records"], Json::array());
+        ASSERT_TRUE(doc["messages"].is_array());
+        EXPECT_FALSE(doc["messages"].empty());
+    }
+}
+
+INSTANTIATE_TEST_SUITE_P(Zrdict, JsonFailure, ::testing::ValuesIn(kJsonFailureCases),
+                         caseName<JsonFailureCase>);
+
+TEST(Read, MissingFileReportsTheParserMessage) {
+    RunResult run = runZrdict({"read", "--format", "json", "/nonexistent/missing.xsd"});
+    EXPECT_EQ(run.exitStatus, 19);
+    Json doc = run.json();
+    ASSERT_TRUE(doc.is_object());
+    EXPECT_EQ(doc.begin().key(), "status");
+    ASSERT_EQ(doc["messages"].size(), 1u) << doc.dump(2);
+    const Json& message = doc["messages"][0];
+    EXPECT_EQ(message["severity"], 8);
+    EXPECT_EQ(message["code"], 4);
+    std::string text = message["text"];
+    EXPECT_TRUE(startsWith(text, "Schema: Fatal: At line ")) << text;
+    EXPECT_TRUE(contains(text, "/nonexistent/missing.xsd")) << text;
+}
+
+TEST(Read, SchemaWithoutDeclarationsHasNoRecords) {
+    RunResult run = runZrdict({"read", "--format", "json", emptySchema()});
+    EXPECT_EQ(run.exitStatus, 0);
+    Json expected = Json::parse(R"({"status": 0, "records": [], "messages": []})");
+    EXPECT_EQ(run.json(), expected);
+}
+
+TEST(Read, JsonShapeOfRecordsAndFields) {
+    RunResult run = runZrdict({"read", "--format", "json", example()});
+    ASSERT_EQ(run.exitStatus, 0) << run.out << run.err;
+    Json doc = run.json();
+    std::vector<std::string> keys;
+    for (auto it = doc.begin(); it != doc.end(); ++it)
+        keys.push_back(it.key());
+    EXPECT_EQ(keys, (std::vector<std::string>{"status", "records", "messages"}));
+    ASSERT_FALSE(doc["records"].empty());
+    const Json& record = doc["records"][0];
+    EXPECT_EQ(record["name"], "purchaseOrder");
+    keys.clear();
+    for (auto it = record.begin(); it != record.end(); ++it)
+        keys.push_back(it.key());
+    EXPECT_EQ(keys, (std::vector<std::string>{"name", "length", "fields"}));
+    ASSERT_FALSE(record["fields"].empty());
+    const Json& field = record["fields"][0];
+    keys.clear();
+    for (auto it = field.begin(); it != field.end(); ++it)
+        keys.push_back(it.key());
+    EXPECT_EQ(keys, (std::vector<std::string>{"name", "alias", "description", "type"}));
+    keys.clear();
+    for (auto it = field["type"].begin(); it != field["type"].end(); ++it)
+        keys.push_back(it.key());
+    ASSERT_GE(keys.size(), 7u);
+    keys.resize(7);
+    EXPECT_EQ(keys, (std::vector<std::string>{"class", "alias", "usage", "length", "precision",
+                                              "decimals", "nulls"}));
+}
+
+TEST(Read, TextOutputIsATablePerRecord) {
+    RunResult run = runZrdict({"read", example()});
+    ASSERT_EQ(run.exitStatus, 0) << run.err;
+    EXPECT_EQ(run.err, "");
+    EXPECT_TRUE(startsWith(run.out, "purchaseOrder (length ")) << run.out;
+    EXPECT_TRUE(contains(run.out, "  field ")) << run.out;
+    EXPECT_TRUE(contains(run.out, "precision  decimals  nulls\n")) << run.out;
+    EXPECT_TRUE(contains(run.out, "\nitem (length ")) << run.out;
+}
+
+TEST(Read, TextOutputSendsMessagesToStderrWithSeverityAndCode) {
+    RunResult run = runZrdict({"read", dataDir() + "/e2e/malformed-xml.xsd"});
+    EXPECT_EQ(run.exitStatus, 19);
+    EXPECT_EQ(run.out, "");
+    EXPECT_TRUE(startsWith(run.err, "fatal 4: Schema: Fatal: At line ")) << run.err;
+    EXPECT_TRUE(contains(run.err, "zrdict: reading ")) << run.err;
+}
+
+TEST(Options, JsonListsTheOptionWithItsValue) {
+    RunResult run = runZrdict({"options", "--format", "json"});
+    ASSERT_EQ(run.exitStatus, 0) << run.err;
+    EXPECT_EQ(run.err, "");
+    Json expected = Json::parse(R"({"options": [{"key": "qualifiedrecordnames",
+        "name": "QualifiedRecordNames", "description": "Strip leading blanks",
+        "default": "False", "value": "False"}], "messages": []})");
+    EXPECT_EQ(run.json(), expected);
+}
+
+TEST(Options, AreAppliedInOrder) {
+    struct Row {
+        std::vector<std::string> settings;
+        const char* value;
+    };
+
+    const Row rows[] = {
+        {{"QualifiedRecordNames=True"}, "True"},
+        {{"qualifiedrecordnames=true"}, "True"},
+        {{"QualifiedRecordNames=True", "QualifiedRecordNames=False"}, "False"},
+        {{"QualifiedRecordNames=False", "QUALIFIEDRECORDNAMES=TRUE"}, "True"},
+        {{"QualifiedRecordNames=yes"}, "False"},
+        {{"QualifiedRecordNames="}, "False"},
+    };
+    for (const Row& row : rows) {
+        std::vector<std::string> args = {"options", "--format", "json"};
+        for (const std::string& setting : row.settings) {
+            args.push_back("--option");
+            args.push_back(setting);
+        }
+        RunResult run = runZrdict(args);
+        SCOPED_TRACE(::testing::PrintToString(row.settings));
+        ASSERT_EQ(run.exitStatus, 0) << run.out;
+        EXPECT_EQ(run.json()["options"][0]["value"], row.value);
+    }
+}
+
+TEST(Options, ReachTheRead) {
+    RunResult plain = runZrdict({"read", "--format", "json", example()});
+    RunResult qualified =
+        runZrdict({"read", "--option", "QualifiedRecordNames=True", "--format", "json", example()});
+    ASSERT_EQ(plain.exitStatus, 0);
+    ASSERT_EQ(qualified.exitStatus, 0);
+    EXPECT_NE(plain.json()["records"], qualified.json()["records"]);
+}
+
+TEST(Types, JsonListsTheBuiltinTable) {
+    RunResult run = runZrdict({"types", "--format", "json"});
+    ASSERT_EQ(run.exitStatus, 0) << run.err;
+    EXPECT_EQ(run.err, "");
+    Json doc = run.json();
+    const Json& types = doc["types"];
+    ASSERT_EQ(types.size(), 95u);
+    for (size_t i = 0; i < types.size(); ++i) {
+        const Json& entry = types[i];
+        std::vector<std::string> keys;
+        for (auto it = entry.begin(); it != entry.end(); ++it)
+            keys.push_back(it.key());
+        EXPECT_EQ(keys,
+                  (std::vector<std::string>{"index", "definition", "class", "alias", "usage"}));
+        EXPECT_EQ(entry["index"], i);
+        // Entries 50 on are the attribute variants: element usage + 256.
+        EXPECT_EQ(entry["usage"].get<int>() >= 256, i >= 50 || i == 1 || i == 4) << i;
+    }
+
+    struct Row {
+        int index;
+        const char* definition;
+        const char* typeClass;
+        const char* alias;
+        int usage;
+    };
+
+    const Row rows[] = {
+        {0, "Text;alias=Character;padchar_invalid;usage=0", "Text", "Character", 0},
+        {2, "Structure;alias=Record;usage=2", "Structure", "Record", 2},
+        {4, "Text;alias='Unquoted attribute';padchar_invalid;usage=259", "Text",
+         "Unquoted attribute", 259},
+        {35,
+         "Number;alias=int;signed_invalid;display;maxlength=32;precision=10;scale_invalid;"
+         "usage=48",
+         "Number", "int", 48},
+        {55,
+         "DateTime;alias='duration attribute';length_invalid;precision_invalid;"
+         "picture='yyyy-mm-ddTH24:MM:SS';usage=277",
+         "DateTime", "duration attribute", 277},
+        {94, "Text;alias='base64Binary attribute';padchar_invalid;usage=321", "Text",
+         "base64Binary attribute", 321},
+    };
+    for (const Row& row : rows) {
+        const Json& entry = types[static_cast<size_t>(row.index)];
+        EXPECT_EQ(entry["definition"], row.definition) << row.index;
+        EXPECT_EQ(entry["class"], row.typeClass) << row.index;
+        EXPECT_EQ(entry["alias"], row.alias) << row.index;
+        EXPECT_EQ(entry["usage"], row.usage) << row.index;
+    }
+}
+
+TEST(Types, TextListsOneLinePerType) {
+    RunResult run = runZrdict({"types"});
+    ASSERT_EQ(run.exitStatus, 0);
+    size_t lines = 0;
+    for (char c : run.out)
+        lines += c == '\n';
+    EXPECT_EQ(lines, 96u) << "a heading and 95 types:\n" << run.out;
+    EXPECT_TRUE(contains(run.out, "'string attribute'")) << run.out;
+}
+
+TEST(Flatten, TextSpokeTurnsEveryFieldIntoTextOfItsLength) {
+    RunResult plain = runZrdict({"flatten", "--format", "json", example(), "item"});
+    RunResult text =
+        runZrdict({"flatten", "--format", "json", "--spoke", "text", example(), "item"});
+    ASSERT_EQ(plain.exitStatus, 0) << plain.out;
+    ASSERT_EQ(text.exitStatus, 0) << text.out;
+    Json plainRecord = plain.json()["records"].at(0);
+    Json textRecord = text.json()["records"].at(0);
+    EXPECT_EQ(textRecord["name"], "item");
+    ASSERT_EQ(plainRecord["fields"].size(), textRecord["fields"].size());
+    ASSERT_FALSE(textRecord["fields"].empty());
+    long sum = 0;
+    for (size_t i = 0; i < textRecord["fields"].size(); ++i) {
+        const Json& before = plainRecord["fields"][i];
+        const Json& after = textRecord["fields"][i];
+        EXPECT_EQ(after["name"], before["name"]);
+        EXPECT_EQ(after["alias"], before["name"]);
+        EXPECT_EQ(after["type"]["class"], "Text");
+        EXPECT_EQ(after["type"]["alias"], "Character");
+        EXPECT_EQ(after["type"]["usage"], 0);
+        EXPECT_EQ(after["type"]["length"], before["type"]["length"]);
+        sum += after["type"]["length"].get<long>();
+    }
+    EXPECT_EQ(textRecord["length"], sum);
+}
+
+// A copy of zrdict in a directory of its own: it looks beside itself first and
+// falls back to the build tree only when nothing is there.
+class PluginLookup : public ::testing::Test {
+  protected:
+    void SetUp() override {
+        std::string pattern = (fs::temp_directory_path() / "zre2e-XXXXXX").string();
+        ASSERT_NE(mkdtemp(pattern.data()), nullptr);
+        dir = pattern;
+        // The host libraries go along: zrdict finds them beside itself too.
+        for (const fs::path& file : {fs::path(ZRDICT_PATH), fs::path(utilLibraryPath()),
+                                     fs::path(utilLibraryPath()).parent_path() / "libzrapi.so"})
+            fs::copy_file(file, dir / file.filename());
+    }
+
+    void TearDown() override { fs::remove_all(dir); }
+
+    RunResult runCopy(const std::vector<std::string>& args) {
+        return runZrdict(args, {}, (dir / "zrdict").string());
+    }
+
+    fs::path dir;
+};
+
+TEST_F(PluginLookup, FallsBackToTheBuildTree) {
+    RunResult run = runCopy({"types", "--format", "json"});
+    EXPECT_EQ(run.exitStatus, 0) << run.err;
+    EXPECT_EQ(run.json()["types"].size(), 95u);
+}
+
+TEST_F(PluginLookup, PrefersTheLibraryBesideTheProgram) {
+    // Not a plug-in at all: if zrdict takes it, loading must fail and name it.
+    fs::copy_file(utilLibraryPath(), dir / "libzrbxmls.so");
+    RunResult run = runCopy({"types"});
+    EXPECT_EQ(run.exitStatus, 3);
+    EXPECT_TRUE(contains(run.err, (dir / "libzrbxmls.so").string())) << run.err;
+    EXPECT_TRUE(contains(run.err, "NewBrowser")) << run.err;
+    EXPECT_EQ(run.out, "");
+}
+
+TEST_F(PluginLookup, ExplicitPathWins) {
+    fs::copy_file(utilLibraryPath(), dir / "libzrbxmls.so");
+    RunResult run = runCopy({"types", "--plugin", pluginPath()});
+    EXPECT_EQ(run.exitStatus, 0) << run.err;
+}
+
+} // namespace

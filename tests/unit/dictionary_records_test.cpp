@@ -1,0 +1,695 @@
+// Record construction over small inline schemas: record and field names, types,
+// derived and referenced content, and every failure a schema can reach.
+#include "dictionary_support.h"
+
+#include <algorithm>
+#include <gtest/gtest.h>
+#include <string>
+
+namespace {
+
+using zrtest::LogCapture;
+using zrtest::readInline;
+using zrtest::SchemaRead;
+using zrtest::wide;
+
+constexpr const char* kTargetNs = R"(targetNamespace="urn:t" xmlns="urn:t")";
+
+struct RecordCase {
+    const char* label;
+    const char* body;
+    const char* records;
+    const char* messages = "";
+    bool ok = true;
+    bool qualified = false;
+    const char* schemaAttrs = "";
+};
+
+// Failures name the row rather than dump its bytes.
+void PrintTo(const RecordCase& row, std::ostream* os) { *os << row.label; }
+
+const RecordCase kCases[] = {
+    {"WorkedExample",
+     R"(<xs:element name="order"><xs:complexType><xs:sequence>
+          <xs:element name="id" type="xs:int"/>
+          <xs:element name="item"><xs:complexType><xs:sequence>
+            <xs:element name="sku" type="xs:string"/>
+          </xs:sequence></xs:complexType></xs:element>
+        </xs:sequence><xs:attribute name="status" type="xs:string"/></xs:complexType></xs:element>)",
+     "order(0):\n"
+     "  id: int(48) 0/10/0 null\n"
+     "  item: Record(2) 0/0/0 notnull\n"
+     "  status: string attribute(272) 0/0/0 null\n"
+     "item(0):\n"
+     "  sku: string(16) 0/0/0 null\n",
+     "", true, false, kTargetNs},
+
+    {"UntypedAnyTypeAndPrefixedBuiltins",
+     R"(<xs:element name="r"><xs:complexType><xs:sequence>
+          <xs:element name="note"/>
+          <xs:element name="any" type="xs:anyType"/>
+          <xs:element name="foreign" type="foo:int"/>
+          <xs:attribute name="untypedAttr"/>
+        </xs:sequence></xs:complexType></xs:element>)",
+     "r(0):\n"
+     "  note: string(16) 0/0/0 null\n"
+     "  any: string(16) 0/0/0 null\n"
+     "  foreign: int(48) 0/10/0 null\n"
+     "  untypedAttr: string attribute(272) 0/0/0 null\n",
+     "", true, false, R"(xmlns:foo="urn:foo")"},
+
+    {"AttributeVariants",
+     R"(<xs:element name="r"><xs:complexType>
+          <xs:attribute name="when" type="xs:dateTime"/>
+          <xs:attribute name="span" type="xs:duration"/>
+          <xs:attribute name="count" type="xs:int"/>
+          <xs:attribute name="big" type="xs:positiveInteger"/>
+          <xs:attribute name="plain" type="xs:Character"/>
+          <xs:attribute name="noVariant" type="xs:Record"/>
+          <xs:attribute name="code"><xs:simpleType><xs:restriction base="xs:string">
+            <xs:maxLength value="8"/></xs:restriction></xs:simpleType></xs:attribute>
+        </xs:complexType></xs:element>)",
+     "r(0):\n"
+     "  when: duration attribute(277) 0/0/0 null\n"
+     "  span: dateTime attribute(278) 0/0/0 null\n"
+     "  count: int attribute(304) 0/10/0 null\n"
+     "  big: positiveInteger attribute(312) 10/0/0 null\n"
+     "  plain: Attribute(256) 0/0/0 null\n"
+     "  noVariant: Record(258) 0/0/0 null\n"
+     "  code: string attribute(272) 8/0/0 null\n"},
+
+    {"NullableInheritedFromEnclosingDeclaration",
+     R"(<xs:element name="r" nullable="false"><xs:complexType><xs:sequence>
+          <xs:element name="inherits" type="xs:int"/>
+          <xs:element name="own" type="xs:int" nullable="TRUE"/>
+          <xs:element name="off" type="xs:int" nullable="False"/>
+        </xs:sequence></xs:complexType></xs:element>
+        <xs:element name="s"><xs:complexType><xs:sequence>
+          <xs:element name="fresh" type="xs:int"/>
+        </xs:sequence></xs:complexType></xs:element>)",
+     "r(0):\n"
+     "  inherits: int(48) 0/10/0 notnull\n"
+     "  own: int(48) 0/10/0 null\n"
+     "  off: int(48) 0/10/0 notnull\n"
+     "s(0):\n"
+     "  fresh: int(48) 0/10/0 null\n"},
+
+    {"RecursiveTypeMeetsItsOwnRecord",
+     R"(<xs:complexType name="Node"><xs:sequence>
+          <xs:element name="value" type="xs:string"/>
+          <xs:element name="node" type="Node"/>
+          <xs:element name="node" type="Node"/>
+        </xs:sequence></xs:complexType>
+        <xs:element name="node" type="Node"/>)",
+     "node(0):\n"
+     "  value: string(16) 0/0/0 null\n"
+     "  node: Record(2) 0/0/0 notnull\n"},
+
+    {"SameNameSharesFirstRecord",
+     R"(<xs:element name="r"><xs:complexType><xs:sequence>
+          <xs:element name="a"><xs:complexType><xs:sequence>
+            <xs:element name="x"><xs:complexType><xs:sequence>
+              <xs:element name="p" type="xs:int"/></xs:sequence></xs:complexType></xs:element>
+          </xs:sequence></xs:complexType></xs:element>
+          <xs:element name="b"><xs:complexType><xs:sequence>
+            <xs:element name="x"><xs:complexType><xs:sequence>
+              <xs:element name="q" type="xs:int"/></xs:sequence></xs:complexType></xs:element>
+          </xs:sequence></xs:complexType></xs:element>
+        </xs:sequence></xs:complexType></xs:element>)",
+     "r(0):\n"
+     "  a: Record(2) 0/0/0 notnull\n"
+     "  b: Record(2) 0/0/0 notnull\n"
+     "a(0):\n"
+     "  x: Record(2) 0/0/0 notnull\n"
+     "x(0):\n"
+     "  p: int(48) 0/10/0 null\n"
+     "b(0):\n"
+     "  x: Record(2) 0/0/0 notnull\n"},
+
+    {"QualifiedNamesKeepDistinctRecords",
+     R"(<xs:element name="r"><xs:complexType><xs:sequence>
+          <xs:element name="a"><xs:complexType><xs:sequence>
+            <xs:element name="x"><xs:complexType><xs:sequence>
+              <xs:element name="p" type="xs:int"/></xs:sequence></xs:complexType></xs:element>
+          </xs:sequence></xs:complexType></xs:element>
+          <xs:element name="b"><xs:complexType><xs:sequence>
+            <xs:element name="x"><xs:complexType><xs:sequence>
+              <xs:element name="q" type="xs:int"/></xs:sequence></xs:complexType></xs:element>
+          </xs:sequence></xs:complexType></xs:element>
+        </xs:sequence></xs:complexType></xs:element>)",
+     "r(0):\n"
+     "  a: Record(2) 0/0/0 notnull\n"
+     "  b: Record(2) 0/0/0 notnull\n"
+     "a(0):\n"
+     "  [a]x: Record(2) 0/0/0 notnull\n"
+     "[a]x(0):\n"
+     "  p: int(48) 0/10/0 null\n"
+     "b(0):\n"
+     "  [b]x: Record(2) 0/0/0 notnull\n"
+     "[b]x(0):\n"
+     "  q: int(48) 0/10/0 null\n",
+     "", true, true},
+
+    {"QualifiedNamesThreeDeep",
+     R"(<xs:element name="order"><xs:complexType><xs:sequence>
+          <xs:element name="item"><xs:complexType><xs:sequence>
+            <xs:element name="detail"><xs:complexType><xs:sequence>
+              <xs:element name="note"><xs:complexType><xs:sequence>
+                <xs:element name="text" type="xs:string"/>
+              </xs:sequence></xs:complexType></xs:element>
+            </xs:sequence></xs:complexType></xs:element>
+          </xs:sequence></xs:complexType></xs:element>
+        </xs:sequence></xs:complexType></xs:element>)",
+     "order(0):\n"
+     "  item: Record(2) 0/0/0 notnull\n"
+     "item(0):\n"
+     "  [item]detail: Record(2) 0/0/0 notnull\n"
+     "[item]detail(0):\n"
+     "  [item!detail]note: Record(2) 0/0/0 notnull\n"
+     "[item!detail]note(0):\n"
+     "  text: string(16) 0/0/0 null\n",
+     "", true, true},
+
+    {"QualifiedNameOnThePathStandsAlone",
+     R"(<xs:complexType name="Part"><xs:sequence>
+          <xs:element name="sub"><xs:complexType><xs:sequence>
+            <xs:element name="part" type="Part"/>
+          </xs:sequence></xs:complexType></xs:element>
+        </xs:sequence></xs:complexType>
+        <xs:element name="top"><xs:complexType><xs:sequence>
+          <xs:element name="part" type="Part"/>
+        </xs:sequence></xs:complexType></xs:element>)",
+     "top(0):\n"
+     "  part: Record(2) 0/0/0 notnull\n"
+     "part(0):\n"
+     "  [part]sub: Record(2) 0/0/0 notnull\n"
+     "[part]sub(0):\n"
+     "  part: Record(2) 0/0/0 notnull\n",
+     "", true, true},
+
+    {"SimpleContentGivesFieldNamedAfterRecord",
+     R"(<xs:complexType name="Price"><xs:simpleContent>
+          <xs:extension base="xs:decimal"><xs:attribute name="currency" type="xs:string"/>
+          </xs:extension></xs:simpleContent></xs:complexType>
+        <xs:element name="price" type="Price"/>)",
+     "price(0):\n"
+     "  price: decimal(20) 0/16/2 null\n"
+     "  currency: string attribute(272) 0/0/0 null\n"},
+
+    {"SimpleContentOverSchemaSimpleType",
+     R"(<xs:simpleType name="Code"><xs:restriction base="xs:string">
+          <xs:maxLength value="6"/></xs:restriction></xs:simpleType>
+        <xs:complexType name="Tagged"><xs:simpleContent><xs:extension base="Code">
+          <xs:attribute name="scheme" type="xs:token"/></xs:extension></xs:simpleContent>
+        </xs:complexType>
+        <xs:element name="tag" type="Tagged"/>)",
+     "tag(0):\n"
+     "  tag: string(16) 6/0/0 null\n"
+     "  scheme: token attribute(319) 0/0/0 null\n"},
+
+    {"ThreeLevelExtensionChainFarthestFirst",
+     R"(<xs:complexType name="A"><xs:sequence><xs:element name="a1" type="xs:int"/></xs:sequence>
+          <xs:attribute name="aa" type="xs:string"/></xs:complexType>
+        <xs:complexType name="B"><xs:complexContent><xs:extension base="A"><xs:sequence>
+          <xs:element name="b1" type="xs:int"/></xs:sequence></xs:extension></xs:complexContent>
+        </xs:complexType>
+        <xs:complexType name="C"><xs:complexContent><xs:extension base="B"><xs:sequence>
+          <xs:element name="c1" type="xs:int"/></xs:sequence></xs:extension></xs:complexContent>
+        </xs:complexType>
+        <xs:element name="c" type="C"/>)",
+     "c(0):\n"
+     "  a1: int(48) 0/10/0 null\n"
+     "  aa: string attribute(272) 0/0/0 null\n"
+     "  b1: int(48) 0/10/0 null\n"
+     "  c1: int(48) 0/10/0 null\n"},
+
+    {"ChainEndingInSimpleContent",
+     R"(<xs:complexType name="Amount"><xs:simpleContent><xs:extension base="xs:decimal">
+          <xs:attribute name="currency" type="xs:string"/></xs:extension></xs:simpleContent>
+        </xs:complexType>
+        <xs:complexType name="Total"><xs:complexContent><xs:extension base="Amount">
+          <xs:attribute name="tax" type="xs:boolean"/></xs:extension></xs:complexContent>
+        </xs:complexType>
+        <xs:element name="total" type="Total"/>)",
+     "total(0):\n"
+     "  total: decimal(20) 0/16/2 null\n"
+     "  currency: string attribute(272) 0/0/0 null\n"
+     "  tax: boolean attribute(273) 0/0/0 null\n"},
+
+    // A simple-content type extending another one takes its text type and
+    // attributes from the whole chain.
+    {"SimpleContentExtendingSimpleContent",
+     R"(<xs:complexType name="Amount"><xs:simpleContent><xs:extension base="xs:decimal">
+          <xs:attribute name="currency" type="xs:string"/></xs:extension></xs:simpleContent>
+        </xs:complexType>
+        <xs:complexType name="Charge"><xs:simpleContent><xs:extension base="Amount">
+          <xs:attribute name="reason" type="xs:token"/></xs:extension></xs:simpleContent>
+        </xs:complexType>
+        <xs:complexType name="Fee"><xs:simpleContent><xs:extension base="Charge">
+          <xs:attribute name="waived" type="xs:boolean"/></xs:extension></xs:simpleContent>
+        </xs:complexType>
+        <xs:element name="fee" type="Fee"/>)",
+     "fee(0):\n"
+     "  fee: decimal(20) 0/16/2 null\n"
+     "  currency: string attribute(272) 0/0/0 null\n"
+     "  reason: token attribute(319) 0/0/0 null\n"
+     "  waived: boolean attribute(273) 0/0/0 null\n"},
+
+    // Simple content over a complex type without simple content has no text type.
+    {"SimpleContentOverComplexContentFails",
+     R"(<xs:complexType name="Box"><xs:sequence><xs:element name="x" type="xs:int"/>
+          </xs:sequence></xs:complexType>
+        <xs:complexType name="Label"><xs:simpleContent><xs:extension base="Box"/>
+        </xs:simpleContent></xs:complexType>
+        <xs:element name="label" type="Label"/>)",
+     "label(0):\n",
+     "512 0 Oops, lookupType asked to lookup a complex type\n"
+     "4 0 Error resolving simple type anon0\n"
+     "4 0 Lookup of type 'anon0' (ns '') failed for field 'label'\n",
+     false},
+
+    {"ExtensionOfSimpleTypeGivesFieldNamedAfterRecord",
+     R"(<xs:complexType name="T"><xs:complexContent><xs:extension base="xs:string">
+          <xs:attribute name="lang" type="xs:language"/></xs:extension></xs:complexContent>
+        </xs:complexType>
+        <xs:element name="text" type="T"/>)",
+     "text(0):\n"
+     "  text: string(16) 0/0/0 null\n"
+     "  lang: language attribute(292) 0/0/0 null\n"},
+
+    {"AnyTypeBaseAddsNothing",
+     R"(<xs:element name="r"><xs:complexType><xs:complexContent>
+          <xs:restriction base="xs:anyType"><xs:sequence><xs:element name="x" type="xs:int"/>
+          </xs:sequence></xs:restriction></xs:complexContent></xs:complexType></xs:element>)",
+     "r(0):\n"
+     "  x: int(48) 0/10/0 null\n"},
+
+    {"ElementAndAttributeReferences",
+     R"(<xs:element name="code" type="xs:string" nullable="false"/>
+        <xs:attribute name="lang" type="xs:language"/>
+        <xs:element name="r"><xs:complexType><xs:sequence>
+          <xs:element ref="code"/><xs:element ref="code"/>
+        </xs:sequence><xs:attribute ref="lang"/></xs:complexType></xs:element>)",
+     "r(0):\n"
+     "  code: string(16) 0/0/0 notnull\n"
+     "  code: string(16) 0/0/0 notnull\n"
+     "  lang: language attribute(292) 0/0/0 null\n"},
+
+    {"ReferenceToRecordElement",
+     R"(<xs:element name="r"><xs:complexType><xs:sequence>
+          <xs:element ref="addr"/>
+        </xs:sequence></xs:complexType></xs:element>
+        <xs:element name="addr"><xs:complexType><xs:sequence>
+          <xs:element name="city" type="xs:string"/>
+          <xs:element ref="addr"/>
+        </xs:sequence></xs:complexType></xs:element>)",
+     "r(0):\n"
+     "  addr: Record(2) 0/0/0 notnull\n"
+     "addr(0):\n"
+     "  city: string(16) 0/0/0 null\n"
+     "  addr: Record(2) 0/0/0 notnull\n"},
+
+    {"GroupsAndAttributeGroups",
+     R"(<xs:group name="g"><xs:sequence><xs:element name="x" type="xs:int"/>
+          <xs:group ref="inner"/><xs:element name="y" type="xs:string"/></xs:sequence></xs:group>
+        <xs:group name="inner"><xs:sequence><xs:element name="z" type="xs:byte"/></xs:sequence>
+        </xs:group>
+        <xs:attributeGroup name="ag"><xs:attribute name="id" type="xs:ID"/></xs:attributeGroup>
+        <xs:element name="r"><xs:complexType><xs:sequence>
+          <xs:element name="first" type="xs:int"/><xs:group ref="g"/><xs:group ref="inner"/>
+        </xs:sequence><xs:attributeGroup ref="ag"/></xs:complexType></xs:element>)",
+     "r(0):\n"
+     "  first: int(48) 0/10/0 null\n"
+     "  x: int(48) 0/10/0 null\n"
+     "  z: byte(50) 0/3/0 null\n"
+     "  y: string(16) 0/0/0 null\n"
+     "  z: byte(50) 0/3/0 null\n"
+     "  id: ID attribute(288) 0/0/0 null\n"},
+
+    {"GroupMetAgainInsideNestedRecord",
+     R"(<xs:group name="g"><xs:sequence><xs:element name="e"><xs:complexType>
+          <xs:sequence><xs:group ref="g"/></xs:sequence></xs:complexType></xs:element>
+        </xs:sequence></xs:group>
+        <xs:element name="r"><xs:complexType><xs:sequence><xs:group ref="g"/></xs:sequence>
+        </xs:complexType></xs:element>)",
+     "r(0):\n"
+     "  e: Record(2) 0/0/0 notnull\n"
+     "e(0):\n"
+     "  e: Record(2) 0/0/0 notnull\n"},
+
+    {"DuplicateDeclarationsGiveTwoFields",
+     R"(<xs:element name="r"><xs:complexType><xs:sequence>
+          <xs:element name="x" type="xs:int"/><xs:element name="x" type="xs:string"/>
+        </xs:sequence></xs:complexType></xs:element>)",
+     "r(0):\n"
+     "  x: int(48) 0/10/0 null\n"
+     "  x: string(16) 0/0/0 null\n"},
+
+    {"AuthorNamedAnonTypeFoundInAnyNamespace",
+     R"(<xs:complexType name="anonAddress"><xs:sequence>
+          <xs:element name="city" type="xs:string"/></xs:sequence></xs:complexType>
+        <xs:element name="r"><xs:complexType><xs:sequence>
+          <xs:element name="home" type="other:anonAddress"/>
+        </xs:sequence></xs:complexType></xs:element>)",
+     "r(0):\n"
+     "  home: Record(2) 0/0/0 notnull\n"
+     "home(0):\n"
+     "  city: string(16) 0/0/0 null\n",
+     "", true, false, R"(targetNamespace="urn:t" xmlns="urn:t" xmlns:other="urn:o")"},
+
+    {"ForeignNamesKeepTheirPrefix",
+     R"(<xs:element name="o:r"><xs:complexType><xs:sequence>
+          <xs:element name="o:x" type="xs:int"/><xs:element name="y" type="xs:int"/>
+        </xs:sequence></xs:complexType></xs:element>)",
+     "o:r(0):\n"
+     "  o:x: int(48) 0/10/0 null\n"
+     "  y: int(48) 0/10/0 null\n",
+     "", true, false, R"(targetNamespace="urn:t" xmlns:o="urn:o")"},
+
+    {"FacetsShapeFields",
+     R"(<xs:simpleType name="Qty"><xs:restriction base="xs:int">
+          <xs:minInclusive value="0"/><xs:maxInclusive value="9999"/></xs:restriction></xs:simpleType>
+        <xs:simpleType name="Status"><xs:restriction base="xs:string">
+          <xs:enumeration value="open"/><xs:enumeration value="shipped"/></xs:restriction>
+        </xs:simpleType>
+        <xs:simpleType name="Zip"><xs:restriction base="xs:string">
+          <xs:pattern value="\d{5}(-\d{4})?"/></xs:restriction></xs:simpleType>
+        <xs:element name="r"><xs:complexType><xs:sequence>
+          <xs:element name="qty" type="Qty"/><xs:element name="status" type="Status"/>
+          <xs:element name="zip" type="Zip"/><xs:element name="again" type="Qty"/>
+        </xs:sequence><xs:attribute name="st" type="Status"/></xs:complexType></xs:element>)",
+     "r(0):\n"
+     "  qty: int(48) 4/4/0 null\n"
+     "  status: string(16) 7/0/0 null\n"
+     "  zip: string(16) 0/10/0 null\n"
+     "  again: int(48) 4/4/0 null\n"
+     "  st: string attribute(272) 7/0/0 null\n"},
+
+    {"TopLevelSimpleOrUnknownTypesBuildNothing",
+     R"(<xs:element name="a" type="xs:int"/><xs:element name="b" type="Unknown"/>
+        <xs:group ref="nowhere"/>)",
+     ""},
+
+    // Failures: the read fails and the records built so far stay with the browser.
+    {"UnknownFieldType",
+     R"(<xs:element name="r"><xs:complexType><xs:sequence>
+          <xs:element name="ok" type="xs:int"/>
+          <xs:element name="s"><xs:complexType><xs:sequence>
+            <xs:element name="bad" type="Nope"/></xs:sequence></xs:complexType></xs:element>
+          <xs:element name="never" type="xs:int"/>
+        </xs:sequence></xs:complexType></xs:element>)",
+     "r(0):\n"
+     "  ok: int(48) 0/10/0 null\n"
+     "s(0):\n",
+     "4 0 Lookup of type 'Nope' (ns 'urn:t') failed for field 'bad'\n", false, false, kTargetNs},
+
+    {"UnresolvableSimpleType",
+     R"(<xs:simpleType name="Broken"><xs:restriction base="Missing"/></xs:simpleType>
+        <xs:element name="r"><xs:complexType><xs:sequence>
+          <xs:element name="b" type="Broken"/></xs:sequence></xs:complexType></xs:element>)",
+     "r(0):\n",
+     "4 0 Error resolving simple type Broken\n"
+     "4 0 Lookup of type 'Broken' (ns '') failed for field 'b'\n",
+     false},
+
+    {"SimpleTypeBasedOnComplexType",
+     R"(<xs:complexType name="C"><xs:sequence><xs:element name="x" type="xs:int"/></xs:sequence>
+        </xs:complexType>
+        <xs:simpleType name="S"><xs:restriction base="C"/></xs:simpleType>
+        <xs:element name="r"><xs:complexType><xs:sequence>
+          <xs:element name="s" type="S"/></xs:sequence></xs:complexType></xs:element>)",
+     "r(0):\n",
+     "512 0 Oops, lookupType asked to lookup a complex type\n"
+     "4 0 Error resolving simple type S\n"
+     "4 0 Lookup of type 'S' (ns '') failed for field 's'\n",
+     false},
+
+    {"SimpleTypeCycle",
+     R"(<xs:simpleType name="A"><xs:restriction base="B"/></xs:simpleType>
+        <xs:simpleType name="B"><xs:restriction base="A"/></xs:simpleType>
+        <xs:element name="r"><xs:complexType><xs:sequence>
+          <xs:element name="a" type="A"/></xs:sequence></xs:complexType></xs:element>)",
+     "r(0):\n",
+     "4 0 Circular base type chain at simple type A\n"
+     "4 0 Error resolving simple type A\n"
+     "4 0 Error resolving simple type B\n"
+     "4 0 Error resolving simple type A\n"
+     "4 0 Lookup of type 'A' (ns '') failed for field 'a'\n",
+     false},
+
+    {"MissingBaseType",
+     R"(<xs:complexType name="T"><xs:complexContent><xs:extension base="Missing">
+          <xs:sequence><xs:element name="x" type="xs:int"/></xs:sequence>
+        </xs:extension></xs:complexContent></xs:complexType>
+        <xs:element name="r" type="T"/>)",
+     "r(0):\n", "4 0 Lookup of type 'Missing' (ns '') failed for field 'r'\n", false},
+
+    {"ExtensionCycle",
+     R"(<xs:complexType name="A"><xs:complexContent><xs:extension base="B"><xs:sequence>
+          <xs:element name="a" type="xs:int"/></xs:sequence></xs:extension></xs:complexContent>
+        </xs:complexType>
+        <xs:complexType name="B"><xs:complexContent><xs:extension base="A"><xs:sequence>
+          <xs:element name="b" type="xs:int"/></xs:sequence></xs:extension></xs:complexContent>
+        </xs:complexType>
+        <xs:element name="e" type="A"/>)",
+     "e(0):\n", "4 0 Circular base type chain at complex type A\n", false},
+
+    {"SelfExtension",
+     R"(<xs:complexType name="A"><xs:complexContent><xs:extension base="A"/></xs:complexContent>
+        </xs:complexType>
+        <xs:element name="e" type="A"/>)",
+     "e(0):\n", "4 0 Circular base type chain at complex type A\n", false},
+
+    {"ExtensionCycleAboveTheRecordType",
+     R"(<xs:complexType name="C"><xs:complexContent><xs:extension base="A"/></xs:complexContent>
+        </xs:complexType>
+        <xs:complexType name="A"><xs:complexContent><xs:extension base="B"/></xs:complexContent>
+        </xs:complexType>
+        <xs:complexType name="B"><xs:complexContent><xs:extension base="A"/></xs:complexContent>
+        </xs:complexType>
+        <xs:element name="e" type="C"/>)",
+     "e(0):\n", "4 0 Circular base type chain at complex type A\n", false},
+
+    {"MissingReference",
+     R"(<xs:element name="r"><xs:complexType><xs:sequence>
+          <xs:element ref="missing"/></xs:sequence></xs:complexType></xs:element>)",
+     "r(0):\n", "4 0 Failed to look up ref to urn:t:missing\n", false, false, kTargetNs},
+
+    {"ReferenceToItself",
+     R"(<xs:element name="a" ref="a"/>
+        <xs:element name="r"><xs:complexType><xs:sequence>
+          <xs:element ref="a"/></xs:sequence></xs:complexType></xs:element>)",
+     "r(0):\n", "4 0 Circular reference to element :a\n", false},
+
+    {"ReferenceCycle",
+     R"(<xs:element name="a" ref="b"/><xs:element name="b" ref="a"/>
+        <xs:element name="r"><xs:complexType><xs:sequence>
+          <xs:element ref="a"/></xs:sequence></xs:complexType></xs:element>)",
+     "r(0):\n", "4 0 Circular reference to element :a\n", false},
+
+    {"MissingGroup",
+     R"(<xs:element name="r"><xs:complexType><xs:sequence>
+          <xs:element name="x" type="xs:int"/><xs:group ref="nothing"/>
+        </xs:sequence></xs:complexType></xs:element>)",
+     "r(0):\n"
+     "  x: int(48) 0/10/0 null\n",
+     "4 4 Unable to find group nothing\n", false},
+
+    {"GroupReferringToItself",
+     R"(<xs:group name="g"><xs:sequence><xs:element name="x" type="xs:int"/>
+          <xs:group ref="g"/></xs:sequence></xs:group>
+        <xs:element name="r"><xs:complexType><xs:group ref="g"/></xs:complexType></xs:element>)",
+     "r(0):\n"
+     "  x: int(48) 0/10/0 null\n",
+     "4 0 Circular reference to group g\n", false},
+
+    {"GroupCycleThroughAnotherGroup",
+     R"(<xs:group name="g1"><xs:sequence><xs:group ref="g2"/></xs:sequence></xs:group>
+        <xs:group name="g2"><xs:sequence><xs:element name="y" type="xs:int"/>
+          <xs:group ref="g1"/></xs:sequence></xs:group>
+        <xs:element name="r"><xs:complexType><xs:group ref="g1"/></xs:complexType></xs:element>)",
+     "r(0):\n"
+     "  y: int(48) 0/10/0 null\n",
+     "4 0 Circular reference to group g1\n", false},
+
+    {"TypeContentReferringToTheTypeAsGroup",
+     R"(<xs:complexType name="T"><xs:sequence><xs:group ref="T"/></xs:sequence></xs:complexType>
+        <xs:element name="r" type="T"/>)",
+     "r(0):\n", "4 0 Circular reference to group T\n", false},
+};
+
+class RecordLayout : public ::testing::TestWithParam<RecordCase> {};
+
+TEST_P(RecordLayout, Builds) {
+    const RecordCase& c = GetParam();
+    const SchemaRead read = readInline(c.body, c.qualified, c.schemaAttrs);
+    EXPECT_EQ(read.ok, c.ok);
+    EXPECT_EQ(read.records, c.records);
+    EXPECT_EQ(read.messages, c.messages);
+}
+
+INSTANTIATE_TEST_SUITE_P(Dictionary, RecordLayout, ::testing::ValuesIn(kCases),
+                         [](const auto& row) { return std::string(row.param.label); });
+
+// The temporary simple type of a simple-content record takes a generated name and
+// leaves the list of simple types as it was.
+TEST(RecordBuilding, SimpleContentTypeIsTemporary) {
+    zrtest::TempDir dir;
+    const std::string path =
+        dir.write("schema.xsd", zrtest::schemaDoc(R"(<xs:complexType name="Price"><xs:simpleContent>
+          <xs:extension base="xs:decimal"/></xs:simpleContent></xs:complexType>
+        <xs:element name="a" type="Price"/><xs:element name="b" type="Price"/>)"));
+    ZrXmlSchemaBrowser browser;
+    ZrXmlSchemaBrowserTestAccess access(browser);
+    ASSERT_TRUE(browser.ReadSchema(wide(path).c_str(), false));
+    EXPECT_EQ(access.simpleTypes().size(), 0u);
+    EXPECT_EQ(access.anonCounter(), 2); // one per simple-content record built
+    EXPECT_EQ(zrtest::dumpRecords(browser.Records()), "a(0):\n"
+                                                      "  a: decimal(20) 0/16/2 null\n"
+                                                      "b(0):\n"
+                                                      "  b: decimal(20) 0/16/2 null\n");
+}
+
+// No schema reaches a record whose type is missing: ReadSchema and addField look the
+// type up before they ask for the record. Asked directly, the record is left empty.
+TEST(RecordBuilding, MissingComplexTypeLeavesEmptyRecord) {
+    ZrXmlSchemaBrowser browser;
+    ZrXmlSchemaBrowserTestAccess access(browser);
+    ElementDef declaration;
+    declaration.name = u"r";
+    declaration.typeName = u"Missing";
+    LogCapture log;
+    EXPECT_EQ(access.buildRecord(declaration), nullptr);
+    EXPECT_EQ(log.lines(), "4 4 Unable to find complex type zrxxxtrg:Missing\n");
+    EXPECT_EQ(zrtest::dumpRecords(browser.Records()), "r(0):\n");
+    EXPECT_TRUE(access.recordWorkList().empty());
+}
+
+// A record already built is returned as it is: no field is added a second time.
+TEST(RecordBuilding, ExistingRecordIsReturnedUnchanged) {
+    ZrXmlSchemaBrowser browser;
+    ZrXmlSchemaBrowserTestAccess access(browser);
+    ComplexTypeDef type;
+    type.name = u"T";
+    ElementDef field;
+    field.name = u"x";
+    field.typeName = u"int";
+    type.content.push_back(field);
+    access.complexTypes().push_back(type);
+    ElementDef declaration;
+    declaration.name = u"r";
+    declaration.typeName = u"T";
+    ZrRecord* first = access.buildRecord(declaration);
+    ASSERT_NE(first, nullptr);
+    EXPECT_EQ(access.buildRecord(declaration), first);
+    EXPECT_EQ(first->FieldCount(), 1);
+    EXPECT_EQ(browser.Records().Count(), 1);
+}
+
+std::string nestedTypes(int depth) {
+    std::string body;
+    for (int i = 0; i < depth; ++i)
+        body += "<xs:element name=\"e" + std::to_string(i) + "\"><xs:complexType><xs:sequence>";
+    body += "<xs:element name=\"leaf\" type=\"xs:int\"/>";
+    for (int i = 0; i < depth; ++i)
+        body += "</xs:sequence></xs:complexType></xs:element>";
+    return body;
+}
+
+// Records nested deeper than the bound fail the read with one message instead of
+// exhausting the stack; nesting at the bound reads.
+TEST(RecordBuilding, NestingDepthIsBounded) {
+    struct Case {
+        int depth;
+        bool ok;
+        const char* messages;
+    };
+
+    const Case cases[] = {
+        {1000, true, ""},
+        {1001, false, "4 0 Schema nesting deeper than 1000 levels at e1000\n"},
+        {1500, false, "4 0 Schema nesting deeper than 1000 levels at e1000\n"},
+    };
+    for (const Case& c : cases) {
+        SCOPED_TRACE(c.depth);
+        const SchemaRead read = readInline(nestedTypes(c.depth));
+        EXPECT_EQ(read.ok, c.ok);
+        EXPECT_EQ(read.messages, c.messages);
+    }
+}
+
+TEST(RecordBuilding, LongGroupAndReferenceChainsAreBounded) {
+    std::string groups = "<xs:element name=\"r\"><xs:complexType><xs:group ref=\"g0\"/>"
+                         "</xs:complexType></xs:element>";
+    std::string refs = "<xs:element name=\"r\"><xs:complexType><xs:sequence>"
+                       "<xs:element ref=\"e0\"/></xs:sequence></xs:complexType></xs:element>";
+    for (int i = 0; i < 1200; ++i) {
+        const std::string next = std::to_string(i + 1);
+        groups += "<xs:group name=\"g" + std::to_string(i) + "\"><xs:sequence><xs:group ref=\"g" +
+                  next + "\"/></xs:sequence></xs:group>";
+        refs += "<xs:element name=\"e" + std::to_string(i) + "\" ref=\"e" + next + "\"/>";
+    }
+    groups += R"(<xs:group name="g1200"><xs:sequence><xs:element name="x" type="xs:int"/>
+                 </xs:sequence></xs:group>)";
+    refs += R"(<xs:element name="e1200" type="xs:int"/>)";
+
+    const SchemaRead groupRead = readInline(groups);
+    EXPECT_FALSE(groupRead.ok);
+    EXPECT_EQ(groupRead.messages, "4 0 Schema nesting deeper than 1000 levels at g999\n");
+    const SchemaRead refRead = readInline(refs);
+    EXPECT_FALSE(refRead.ok);
+    EXPECT_EQ(refRead.messages, "4 0 Schema nesting deeper than 1000 levels at e999\n");
+}
+
+TEST(RecordBuilding, LongExtensionChainIsBounded) {
+    std::string body;
+    for (int i = 0; i < 1200; ++i)
+        body += "<xs:complexType name=\"T" + std::to_string(i) +
+                "\"><xs:complexContent><xs:extension base=\"T" + std::to_string(i + 1) +
+                "\"/></xs:complexContent></xs:complexType>";
+    body += R"(<xs:complexType name="T1200"><xs:sequence><xs:element name="x" type="xs:int"/>
+               </xs:sequence></xs:complexType><xs:element name="r" type="T0"/>)";
+    const SchemaRead read = readInline(body);
+    EXPECT_FALSE(read.ok);
+    EXPECT_EQ(read.messages, "4 0 Schema nesting deeper than 1000 levels at T1000\n");
+}
+
+// Groups that each use the next one twice would expand to 2^25 fields; the read
+// stops at its step ceiling instead.
+TEST(RecordBuilding, FanningOutGroupsAreBounded) {
+    std::string body = "<xs:element name=\"r\"><xs:complexType><xs:group ref=\"g0\"/>"
+                       "</xs:complexType></xs:element>";
+    for (int i = 0; i < 25; ++i) {
+        const std::string next = "<xs:group ref=\"g" + std::to_string(i + 1) + "\"/>";
+        body += "<xs:group name=\"g" + std::to_string(i) + "\"><xs:sequence>" + next + next +
+                "</xs:sequence></xs:group>";
+    }
+    body += R"(<xs:group name="g25"><xs:sequence><xs:element name="x" type="xs:int"/>
+               </xs:sequence></xs:group>)";
+    const SchemaRead read = readInline(body);
+    EXPECT_FALSE(read.ok);
+    EXPECT_EQ(read.messages.rfind("4 0 Schema expands beyond ", 0), 0u) << read.messages;
+    EXPECT_EQ(std::count(read.messages.begin(), read.messages.end(), '\n'), 1);
+}
+
+// Qualified record names over types shared along every path would make 2^25 records.
+TEST(RecordBuilding, QualifiedNamesOverSharedTypesAreBounded) {
+    std::string body;
+    for (int i = 0; i < 25; ++i) {
+        const std::string next = "T" + std::to_string(i + 1);
+        body += "<xs:complexType name=\"T" + std::to_string(i) + "\"><xs:sequence>" +
+                "<xs:element name=\"a" + std::to_string(i) + "\" type=\"" + next + "\"/>" +
+                "<xs:element name=\"b" + std::to_string(i) + "\" type=\"" + next + "\"/>" +
+                "</xs:sequence></xs:complexType>";
+    }
+    body += R"(<xs:complexType name="T25"><xs:sequence><xs:element name="x" type="xs:int"/>
+               </xs:sequence></xs:complexType><xs:element name="r" type="T0"/>)";
+    const SchemaRead read = readInline(body, true);
+    EXPECT_FALSE(read.ok);
+    EXPECT_EQ(read.messages.rfind("4 0 Schema expands beyond ", 0), 0u) << read.messages;
+    // Without qualified names the same schema is small.
+    const SchemaRead plain = readInline(body, false);
+    EXPECT_TRUE(plain.ok) << plain.messages;
+}
+
+} // namespace

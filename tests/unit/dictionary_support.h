@@ -1,0 +1,51 @@
+// Helpers of the dictionary tests: read an inline schema and dump the records it
+// builds as stable text.
+#pragma once
+
+#include "TestSupport.h"
+
+#include <string>
+
+namespace zrtest {
+
+// One line per record, "name(length):", then one indented line per field,
+// "name: alias(usage) length/precision/decimals null|notnull".
+inline std::string dumpRecords(const ZrRecordList& records) {
+    std::string out;
+    for (int r = 0; r < records.Count(); ++r) {
+        const ZrRecord* record = records[r];
+        out += utf8(record->name) + "(" + std::to_string(record->RecordLength()) + "):\n";
+        for (int f = 0; f < record->FieldCount(); ++f) {
+            const ZrField* field = record->GetFieldbyPos(f);
+            const ZrDType& type = field->DataType();
+            out += "  " + utf8(field->FieldName()) + ": " + type.Alias() + "(" +
+                   std::to_string(type.Usage()) + ") " + std::to_string(type.Length()) + "/" +
+                   std::to_string(type.Precision()) + "/" + std::to_string(type.DecimalPlaces()) +
+                   (type.Nulls() ? " null" : " notnull") + "\n";
+        }
+    }
+    return out;
+}
+
+struct SchemaRead {
+    bool ok = false;
+    std::string records;  // dumpRecords of the browser's records, failed or not
+    std::string messages; // LogCapture::lines()
+};
+
+// Reads `body` wrapped in a schema element (with `schemaAttrs` on it) through a
+// fresh browser.
+inline SchemaRead readInline(const std::string& body, bool qualified = false,
+                             const std::string& schemaAttrs = "") {
+    TempDir dir;
+    const std::string path = dir.write("schema.xsd", schemaDoc(body, schemaAttrs));
+    ZrXmlSchemaBrowser browser;
+    LogCapture log;
+    SchemaRead result;
+    result.ok = browser.ReadSchema(wide(path).c_str(), qualified);
+    result.records = dumpRecords(browser.Records());
+    result.messages = log.lines();
+    return result;
+}
+
+} // namespace zrtest

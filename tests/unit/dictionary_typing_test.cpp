@@ -1,0 +1,473 @@
+// Field typing: pattern lengths, numeric limits, simple-type resolution.
+#include "TestSupport.h"
+
+#include <cstdint>
+#include <gtest/gtest.h>
+#include <memory>
+#include <random>
+#include <string>
+
+namespace {
+
+using zrtest::LogCapture;
+using zrtest::wide;
+
+constexpr long kUnchanged = 777;
+
+// A pattern in a buffer of exactly its length plus the terminator, so that the
+// sanitizer catches any read past the end.
+std::unique_ptr<XMLCh[]> exactText(const std::string& text) {
+    const std::u16string wideText = zrUtf8ToUtf16(text);
+    auto buffer = std::make_unique<XMLCh[]>(wideText.size() + 1);
+    std::copy(wideText.begin(), wideText.end(), buffer.get());
+    buffer[wideText.size()] = 0;
+    return buffer;
+}
+
+long patternPrecision(ZrXmlSchemaBrowserTestAccess& access, const std::string& pattern) {
+    ZrDType type;
+    type.Precision(kUnchanged);
+    auto text = exactText(pattern);
+    access.dtPattern(type, text.get());
+    return type.Precision();
+}
+
+struct PatternCase {
+    const char* label;
+    std::string pattern;
+    long precision; // kUnchanged: no precision set
+};
+
+// Failures name the row rather than dump its bytes.
+void PrintTo(const PatternCase& row, std::ostream* os) { *os << row.label; }
+
+const PatternCase kPatterns[] = {
+    {"DigitsWithDash", R"(\d{3}-\d{4})", 8},
+    {"ClassAndOptionalGroup", "[A-Z]{2}(ab|cde)?", 5},
+    {"LongestTopLevelBranch", "ab|cdef", 4},
+    {"PlusIsUnbounded", "a+", kUnchanged},
+    {"StarIsUnbounded", "ab*", kUnchanged},
+    {"OpenRangeIsUnbounded", "x{2,}", kUnchanged},
+    {"ZeroRepeatIsUnbounded", "{0}", kUnchanged},
+    {"ZeroRepeatAfterAtom", "a{0}", kUnchanged},
+    {"UnboundedLaterBranch", "abc|d+", kUnchanged},
+    {"UnboundedInsideGroup", "(a|b*)c", kUnchanged},
+    {"PlainText", "abc", 3},
+    {"EmptyBranchOnly", "|", kUnchanged},
+    {"TrailingBar", "ab|", 2},
+    {"GroupTakesLongestAlternative", "(a|bc)(d|efg)", 5},
+    {"QuantifiedGroup", "(ab){3}", 6},
+    {"RangeTakesHigh", "a{2,5}", 5},
+    {"RangeWithoutLow", "a{,8}", 8},
+    {"ExactRepeat", "a{5}", 5},
+    {"RepeatOfOneAddsNothing", "ab{1}", 2},
+    {"OptionalCountsOnce", "a?b?", 2},
+    {"NestedClassIsOneCharacter", "[[a]b]c", 2},
+    {"PropertyEscape", R"(\p{L}{3})", 3},
+    {"NegatedPropertyEscape", R"(\P{Lu}x)", 2},
+    {"EscapedMetacharacter", R"(\(\*)", 2},
+    {"NestedGroups", "((a|bb)c|d){2}", 6},
+    // Malformed patterns: the scan ends inside the text and counts what it read.
+    {"StrayCloseCountsAsCharacter", "ab)c", 4},
+    {"OnlyStrayClose", ")", 1},
+    {"StrayCloseThenQuantifier", "a){3}", 4},
+    {"StrayCloseInLaterBranch", "a|b))c", 4},
+    {"BackslashAtEnd", "a\\", 2},
+    {"UnfinishedPropertyEscape", R"(\p{L)", 1},
+    {"PropertyEscapeWithoutBrace", R"(a\p)", 2},
+    {"UnclosedClass", "[abc", 1},
+    {"UnclosedGroup", "(ab", 2},
+    {"UnclosedGroupAfterBar", "(ab|", 2},
+    {"OpenGroupAtEnd", "a(", 1},
+    {"UnfinishedQuantifier", "a{3", kUnchanged},
+    {"BraceAtEnd", "a{", kUnchanged},
+    {"QuantifierWithoutDigits", "a{x}", kUnchanged},
+    {"OnlyOpenGroups", "((((", kUnchanged},
+    // Overflow: lengths saturate at the largest 32-bit value.
+    {"HugeRepeat", "a{99999999999}", 2147483647},
+    {"HugeRepeatOfHugeGroup", "(a{99999999999}){99999999999}", 2147483647},
+    {"HugeRepeatThenMore", "a{4294967296}bc", 2147483647},
+    {"LongPattern", std::string(100000, 'a'), 100000},
+    // Nesting: deeper than 256 groups counts as unbounded.
+    {"DeepButBounded", std::string(200, '(') + "a" + std::string(200, ')'), 1},
+    {"TooDeep", std::string(300, '(') + "a" + std::string(300, ')'), kUnchanged},
+    {"TooDeepUnclosed", std::string(100000, '('), kUnchanged},
+};
+
+class Pattern : public ::testing::TestWithParam<PatternCase> {};
+
+TEST_P(Pattern, Precision) {
+    ZrXmlSchemaBrowser browser;
+    ZrXmlSchemaBrowserTestAccess access(browser);
+    EXPECT_EQ(patternPrecision(access, GetParam().pattern), GetParam().precision);
+}
+
+INSTANTIATE_TEST_SUITE_P(Dictionary, Pattern, ::testing::ValuesIn(kPatterns),
+                         [](const auto& row) { return std::string(row.param.label); });
+
+struct ScanCase {
+    const char* text;
+    long result;
+    size_t consumed; // characters the cursor moved over
+};
+
+TEST(PatternScan, BranchLengthStopsAfterItsBar) {
+    ZrXmlSchemaBrowser browser;
+    ZrXmlSchemaBrowserTestAccess access(browser);
+    const ScanCase cases[] = {
+        {"ab|cdef", 2, 3}, {"", 0, 0},       {"a*b", -1, 1}, {"(x|yy)z", 3, 7},
+        {"a\\", 2, 2},     {"\\p{Lu", 1, 5}, {"ab)c", 4, 4}, {"[a-z]{2}|q", 2, 9},
+    };
+    for (const ScanCase& c : cases) {
+        SCOPED_TRACE(c.text);
+        auto text = exactText(c.text);
+        const XMLCh* cursor = text.get();
+        EXPECT_EQ(access.branchLength(cursor), c.result);
+        EXPECT_EQ(size_t(cursor - text.get()), c.consumed);
+    }
+}
+
+TEST(PatternScan, LengthSpec) {
+    ZrXmlSchemaBrowser browser;
+    ZrXmlSchemaBrowserTestAccess access(browser);
+    // The cursor starts just past "{".
+    const ScanCase cases[] = {
+        {"5}", 5, 2},
+        {"2,8}", 8, 4},
+        {",8}", 8, 3},
+        {"3,}", -1, 3},
+        {"0}", -1, 2},
+        {"}", -1, 1},
+        {"5", -1, 1},
+        {"5,x}", -1, 2},
+        {"", -1, 0},
+        {"0,0}", 0, 4},
+        {"99999999999}", 2147483647, 12},
+    };
+    for (const ScanCase& c : cases) {
+        SCOPED_TRACE(c.text);
+        auto text = exactText(c.text);
+        const XMLCh* cursor = text.get();
+        EXPECT_EQ(access.lengthSpec(cursor), c.result);
+        EXPECT_EQ(size_t(cursor - text.get()), c.consumed);
+    }
+}
+
+// Random patterns over the scan's metacharacters: every one ends, never reads past
+// its terminator, and yields either no precision or a saturated positive one.
+TEST(PatternScan, RandomPatternsEndInsideTheirText) {
+    ZrXmlSchemaBrowser browser;
+    ZrXmlSchemaBrowserTestAccess access(browser);
+    const std::string alphabet = "()[]{}\\|*+?,0123456789pPa";
+    std::mt19937 random(20240611);
+    for (int round = 0; round < 20000; ++round) {
+        std::string pattern(random() % 40, ' ');
+        for (char& c : pattern)
+            c = alphabet[random() % alphabet.size()];
+        SCOPED_TRACE(pattern);
+        const long precision = patternPrecision(access, pattern);
+        EXPECT_TRUE(precision == kUnchanged || (precision >= 1 && precision <= 2147483647));
+    }
+}
+
+struct LimitCase {
+    const char* label;
+    const char* typeName; // built-in type whose usage decides
+    bool attribute;
+    const char* minInclusive;
+    const char* maxInclusive;
+    const char* minExclusive;
+    const char* maxExclusive;
+    long digits; // kUnchanged: precision and length untouched
+};
+
+void PrintTo(const LimitCase& row, std::ostream* os) { *os << row.label; }
+
+const LimitCase kLimits[] = {
+    {"ZeroTo999", "int", false, "0", "999", "", "", 3},
+    {"MaxExclusive1000", "int", false, "", "", "", "1000", 3},
+    {"MaxExclusiveZero", "int", false, "", "", "", "0", 1},
+    {"SignTakesNoDigit", "int", false, "-50", "9", "", "", 2},
+    {"SmallestInt", "int", false, "-2147483648", "", "", "", 10},
+    {"SmallestIntExclusive", "int", false, "", "", "-2147483648", "", 10},
+    {"ClampedBelowRange", "long", false, "-99999999999", "", "", "", 10},
+    {"ClampedAboveRange", "long", false, "", "99999999999", "", "", 10},
+    {"MinExclusiveAddsOne", "int", false, "", "", "99", "", 3},
+    {"InclusiveBeatsExclusive", "int", false, "5", "", "99999", "", 1},
+    {"ExponentIgnored", "int", false, "", "1e5", "", "", 1},
+    {"LeadingBlanksAndSign", "int", false, "", "  +42", "", "", 2},
+    {"NoNumberIsZero", "int", false, "", "abc", "", "", kUnchanged},
+    {"ZeroBothSides", "int", false, "0", "0", "", "", kUnchanged},
+    {"DecimalPointStops", "short", false, "", "123.456", "", "", 3},
+    {"IntAttribute", "int", true, "0", "99", "", "", 2},
+    {"StringUntouched", "string", false, "0", "999", "", "", kUnchanged},
+    {"StringAttributeUntouched", "string", true, "0", "999", "", "", kUnchanged},
+    {"DecimalUntouched", "decimal", false, "0", "999", "", "", kUnchanged},
+    {"DateUntouched", "date", false, "0", "999", "", "", kUnchanged},
+    {"HexBinaryUntouched", "hexBinary", false, "0", "999", "", "", kUnchanged},
+    {"NormalizedStringCounted", "normalizedString", false, "0", "999", "", "", 3},
+    {"TokenCounted", "token", false, "0", "999", "", "", 3},
+    {"CharacterCounted", "Character", false, "0", "12345", "", "", 5},
+    {"PositiveIntegerCounted", "positiveInteger", false, "1", "100", "", "", 3},
+};
+
+class Limits : public ::testing::TestWithParam<LimitCase> {};
+
+TEST_P(Limits, Digits) {
+    const LimitCase& c = GetParam();
+    ZrXmlSchemaBrowser browser;
+    ZrXmlSchemaBrowserTestAccess access(browser);
+    ZrDType type = *browser.TypeByName(wide(c.typeName).c_str());
+    if (c.attribute)
+        type.Usage(short(type.Usage() + 256));
+    type.Precision(kUnchanged);
+    type.Length(kUnchanged);
+    access.dtLimits(type, wide(c.minInclusive).c_str(), wide(c.maxInclusive).c_str(),
+                    wide(c.minExclusive).c_str(), wide(c.maxExclusive).c_str());
+    EXPECT_EQ(type.Precision(), c.digits);
+    EXPECT_EQ(type.Length(), c.digits);
+}
+
+INSTANTIATE_TEST_SUITE_P(Dictionary, Limits, ::testing::ValuesIn(kLimits),
+                         [](const auto& row) { return std::string(row.param.label); });
+
+// Simple types placed in the model by hand, resolved by lookupType.
+struct Facets {
+    const char* name;
+    const char* base;
+    const char* length = "";
+    const char* maxLength = "";
+    const char* scale = "";
+    const char* precision = "";
+    const char* minInclusive = "";
+    const char* maxInclusive = "";
+    const char* pattern = "";
+    int32_t maxEnumLength = 0;
+};
+
+SimpleTypeDef simpleType(const Facets& f) {
+    SimpleTypeDef type;
+    type.name = wide(f.name);
+    type.baseName = wide(f.base);
+    type.length = wide(f.length);
+    type.maxLength = wide(f.maxLength);
+    type.scale = wide(f.scale);
+    type.precision = wide(f.precision);
+    type.minInclusive = wide(f.minInclusive);
+    type.maxInclusive = wide(f.maxInclusive);
+    type.pattern = wide(f.pattern);
+    type.maxEnumLength = f.maxEnumLength;
+    return type;
+}
+
+struct ResolveCase {
+    const char* label;
+    Facets facets;
+    const char* alias;
+    long length;
+    long precision;
+    short decimals;
+};
+
+void PrintTo(const ResolveCase& row, std::ostream* os) { *os << row.label; }
+
+const ResolveCase kResolves[] = {
+    {"MaxLength", {"t", "string", "", "20"}, "string", 20, 0, 0},
+    {"LengthBeatsMaxLength", {"t", "string", "10", "20"}, "string", 10, 0, 0},
+    {"EnumerationBeatsLengths",
+     {"t", "string", "10", "20", "", "", "", "", "", 7},
+     "string",
+     7,
+     0,
+     0},
+    {"LimitsOnInt", {"t", "int", "", "", "", "", "0", "999"}, "int", 3, 3, 0},
+    {"LimitsBeatPrecisionFacet", {"t", "int", "", "", "", "5", "0", "999"}, "int", 3, 3, 0},
+    {"PatternBeatsLimits", {"t", "int", "", "", "", "", "0", "999", R"(\d{6})"}, "int", 3, 6, 0},
+    {"PatternBeatsPrecisionFacet",
+     {"t", "int", "", "", "", "9", "", "", "[0-9]{4}"},
+     "int",
+     0,
+     4,
+     0},
+    {"EnumerationBeatsLimits", {"t", "int", "", "", "", "", "0", "999", "", 5}, "int", 5, 3, 0},
+    {"DecimalKeepsPrecisionOverLimits",
+     {"t", "decimal", "", "", "", "", "0", "999"},
+     "decimal",
+     0,
+     16,
+     2},
+    {"PrecisionAndScale", {"t", "decimal", "", "", "3", "8"}, "decimal", 0, 8, 3},
+    {"ScaleClampedToShort", {"t", "decimal", "", "", "99999"}, "decimal", 0, 16, 32767},
+    {"AnyTypeBaseIsString", {"t", "anyType", "", "12"}, "string", 12, 0, 0},
+    {"UnusablePatternLeavesPrecision", {"t", "int", "", "", "", "", "", "", "a+"}, "int", 0, 10, 0},
+};
+
+class Resolve : public ::testing::TestWithParam<ResolveCase> {};
+
+TEST_P(Resolve, DerivesDataType) {
+    const ResolveCase& c = GetParam();
+    ZrXmlSchemaBrowser browser;
+    ZrXmlSchemaBrowserTestAccess access(browser);
+    access.simpleTypes().push_back(simpleType(c.facets));
+    LogCapture log;
+    ZrDType type;
+    ASSERT_TRUE(access.lookupType(u"t", u"", type));
+    EXPECT_STREQ(type.Alias(), c.alias);
+    EXPECT_EQ(type.Length(), c.length);
+    EXPECT_EQ(type.Precision(), c.precision);
+    EXPECT_EQ(type.DecimalPlaces(), c.decimals);
+    EXPECT_TRUE(access.simpleTypes()[0].resolved);
+    EXPECT_EQ(log.lines(), "");
+}
+
+INSTANTIATE_TEST_SUITE_P(Dictionary, Resolve, ::testing::ValuesIn(kResolves),
+                         [](const auto& row) { return std::string(row.param.label); });
+
+TEST(ResolveSimpleType, DerivedTypeStartsFromItsResolvedBase) {
+    ZrXmlSchemaBrowser browser;
+    ZrXmlSchemaBrowserTestAccess access(browser);
+    access.simpleTypes().push_back(simpleType({"code", "string", "", "5"}));
+    access.simpleTypes().push_back(
+        simpleType({"shortCode", "code", "", "", "", "", "", "", "[A-Z]{3}"}));
+    ZrDType type;
+    ASSERT_TRUE(access.lookupType(u"shortCode", u"", type));
+    EXPECT_STREQ(type.Alias(), "string");
+    EXPECT_EQ(type.Length(), 5);
+    EXPECT_EQ(type.Precision(), 3);
+    EXPECT_TRUE(access.simpleTypes()[0].resolved);
+}
+
+TEST(ResolveSimpleType, ResolvesOncePerType) {
+    ZrXmlSchemaBrowser browser;
+    ZrXmlSchemaBrowserTestAccess access(browser);
+    access.simpleTypes().push_back(simpleType({"t", "string", "", "20"}));
+    ZrDType first;
+    ASSERT_TRUE(access.lookupType(u"t", u"", first));
+    // A later change of the facets is not seen: the first derivation is reused.
+    access.simpleTypes()[0].maxLength = u"99";
+    ZrDType second;
+    ASSERT_TRUE(access.lookupType(u"t", u"", second));
+    EXPECT_EQ(second.Length(), 20);
+}
+
+TEST(ResolveSimpleType, NamespaceMustMatchUnlessGenerated) {
+    ZrXmlSchemaBrowser browser;
+    ZrXmlSchemaBrowserTestAccess access(browser);
+    SimpleTypeDef named = simpleType({"t", "string", "", "20"});
+    named.nameNs = u"urn:a";
+    access.simpleTypes().push_back(named);
+    access.simpleTypes().push_back(simpleType({"anon3", "string", "", "30"}));
+    ZrDType type;
+    EXPECT_FALSE(access.lookupType(u"t", u"urn:b", type));
+    ASSERT_TRUE(access.lookupType(u"t", u"urn:a", type));
+    EXPECT_EQ(type.Length(), 20);
+    ASSERT_TRUE(access.lookupType(u"anon3", u"urn:anything", type));
+    EXPECT_EQ(type.Length(), 30);
+    // A built-in alias answers whatever namespace the name carries.
+    ASSERT_TRUE(access.lookupType(u"int", u"urn:anything", type));
+    EXPECT_EQ(type.Usage(), 48);
+}
+
+struct FailureCase {
+    const char* label;
+    std::vector<Facets> types;
+    const char* sought;
+    const char* messages;
+};
+
+void PrintTo(const FailureCase& row, std::ostream* os) { *os << row.label; }
+
+const FailureCase kFailures[] = {
+    {"UnknownName", {}, "nothing", ""},
+    {"MissingBase", {{"t", "nothing"}}, "t", "4 0 Error resolving simple type t\n"},
+    {"EmptyBase", {{"t", ""}}, "t", "4 0 Error resolving simple type t\n"},
+    {"MissingBaseTwoLevelsDown",
+     {{"a", "b"}, {"b", "nothing"}},
+     "a",
+     "4 0 Error resolving simple type b\n"
+     "4 0 Error resolving simple type a\n"},
+    {"SelfBase",
+     {{"a", "a"}},
+     "a",
+     "4 0 Circular base type chain at simple type a\n"
+     "4 0 Error resolving simple type a\n"
+     "4 0 Error resolving simple type a\n"},
+    {"TwoTypeCycle",
+     {{"a", "b"}, {"b", "a"}},
+     "a",
+     "4 0 Circular base type chain at simple type a\n"
+     "4 0 Error resolving simple type a\n"
+     "4 0 Error resolving simple type b\n"
+     "4 0 Error resolving simple type a\n"},
+    {"CycleBelowTheTypeSought",
+     {{"top", "a"}, {"a", "b"}, {"b", "a"}},
+     "top",
+     "4 0 Circular base type chain at simple type a\n"
+     "4 0 Error resolving simple type a\n"
+     "4 0 Error resolving simple type b\n"
+     "4 0 Error resolving simple type a\n"
+     "4 0 Error resolving simple type top\n"},
+};
+
+class ResolveFailure : public ::testing::TestWithParam<FailureCase> {};
+
+TEST_P(ResolveFailure, FailsAndLeavesTypeUnresolved) {
+    const FailureCase& c = GetParam();
+    ZrXmlSchemaBrowser browser;
+    ZrXmlSchemaBrowserTestAccess access(browser);
+    for (const Facets& f : c.types)
+        access.simpleTypes().push_back(simpleType(f));
+    LogCapture log;
+    ZrDType type;
+    type.Precision(kUnchanged);
+    EXPECT_FALSE(access.lookupType(wide(c.sought).c_str(), u"", type));
+    EXPECT_EQ(type.Precision(), kUnchanged);
+    EXPECT_EQ(log.lines(), c.messages);
+    for (SimpleTypeDef& t : access.simpleTypes())
+        EXPECT_FALSE(t.resolved);
+}
+
+INSTANTIATE_TEST_SUITE_P(Dictionary, ResolveFailure, ::testing::ValuesIn(kFailures),
+                         [](const auto& row) { return std::string(row.param.label); });
+
+TEST(ResolveSimpleType, ComplexTypeIsRefused) {
+    ZrXmlSchemaBrowser browser;
+    ZrXmlSchemaBrowserTestAccess access(browser);
+    ComplexTypeDef complex;
+    complex.name = u"c";
+    access.complexTypes().push_back(complex);
+    access.simpleTypes().push_back(simpleType({"t", "c"}));
+    LogCapture log;
+    ZrDType type;
+    EXPECT_FALSE(access.lookupType(u"c", u"", type));
+    EXPECT_FALSE(access.lookupType(u"t", u"", type));
+    EXPECT_EQ(log.lines(), "512 0 Oops, lookupType asked to lookup a complex type\n"
+                           "512 0 Oops, lookupType asked to lookup a complex type\n"
+                           "4 0 Error resolving simple type t\n");
+}
+
+// A base chain longer than the nesting bound fails instead of exhausting the stack;
+// one at the bound resolves.
+TEST(ResolveSimpleType, LongBaseChainsAreBounded) {
+    for (int length : {1000, 1001, 5000}) {
+        SCOPED_TRACE(length);
+        ZrXmlSchemaBrowser browser;
+        ZrXmlSchemaBrowserTestAccess access(browser);
+        for (int i = 0; i < length; ++i) {
+            const std::string base = i + 1 < length ? "t" + std::to_string(i + 1) : "string";
+            access.simpleTypes().push_back(
+                simpleType({("t" + std::to_string(i)).c_str(), base.c_str()}));
+        }
+        LogCapture log;
+        ZrDType type;
+        const bool resolved = access.lookupType(u"t0", u"", type);
+        EXPECT_EQ(resolved, length <= 1000);
+        if (!resolved) {
+            ASSERT_FALSE(log.messages.empty());
+            EXPECT_EQ(log.messages[0].text, "Schema nesting deeper than 1000 levels at t1000");
+            EXPECT_EQ(log.messages.back().text, "Error resolving simple type t0");
+        }
+    }
+}
+
+} // namespace

@@ -1,0 +1,269 @@
+// Host dictionary interface: record and record-list copies and lookups, and the
+// option machinery of the browser base class.
+#include "zrapi.h"
+#include "zrglob.h"
+
+#include <gtest/gtest.h>
+#include <string>
+#include <vector>
+
+namespace {
+
+ZrDType textType(long length) {
+    ZrDType type;
+    type.Define("Text;alias=string;padchar_invalid;usage=16");
+    type.Length(length);
+    return type;
+}
+
+ZrRecord makeRecord(const char16_t* name, std::initializer_list<const char16_t*> fields) {
+    ZrRecord record;
+    record.name = name;
+    long length = 1;
+    for (const char16_t* field : fields)
+        record.NewField(textType(length++), field)->Description("desc");
+    return record;
+}
+
+std::u16string fieldNames(const ZrRecord& record) {
+    std::u16string out;
+    for (int i = 0; i < record.FieldCount(); ++i)
+        out += record.GetFieldbyPos(i)->FieldName().str() + u";";
+    return out;
+}
+
+TEST(HostRecord, CopyIsDeepAndIndependent) {
+    ZrRecord original = makeRecord(u"order", {u"id", u"item"});
+    original.RecordLength(7);
+    original.GetFieldbyPos(0)->Alias(u"alias");
+    original.GetFieldbyPos(0)->EditPicture("999");
+
+    ZrRecord copy(original);
+    EXPECT_EQ(copy.name.str(), u"order");
+    EXPECT_EQ(copy.RecordLength(), 7);
+    EXPECT_EQ(fieldNames(copy), u"id;item;");
+    ZrField* field = copy.GetFieldbyPos(0);
+    EXPECT_NE(field, original.GetFieldbyPos(0));
+    EXPECT_EQ(field->Alias().str(), u"alias");
+    EXPECT_STREQ(field->Description(), "desc");
+    EXPECT_STREQ(field->EditPicture(), "999");
+    field->Description(nullptr);
+    EXPECT_STREQ(field->Description(), "");
+    EXPECT_STREQ(original.GetFieldbyPos(0)->Description(), "desc");
+    EXPECT_EQ(field->DataType().Length(), 1);
+
+    field->FieldName(u"changed");
+    field->DataType().Length(50);
+    EXPECT_EQ(original.GetFieldbyPos(0)->FieldName().str(), u"id");
+    EXPECT_EQ(original.GetFieldbyPos(0)->DataType().Length(), 1);
+
+    ZrRecord assigned;
+    assigned = original;
+    const ZrRecord& same = assigned;
+    assigned = same; // self-assignment keeps the fields
+    EXPECT_EQ(fieldNames(assigned), u"id;item;");
+}
+
+TEST(HostRecord, FieldLookupsAndAppend) {
+    ZrRecord record = makeRecord(u"r", {u"a", u"b", u"a"});
+    EXPECT_EQ(record.GetFieldbyName(u"a"), record.GetFieldbyPos(0));
+    EXPECT_EQ(record.GetFieldbyName(u"missing"), nullptr);
+    EXPECT_EQ(record.GetFieldbyPos(-1), nullptr);
+    EXPECT_EQ(record.GetFieldbyPos(3), nullptr);
+    EXPECT_FALSE(record.AppendField(nullptr));
+    EXPECT_TRUE(record.AppendField(new ZrField(textType(9))));
+    EXPECT_EQ(record.FieldCount(), 4);
+    EXPECT_EQ(record.GetFieldbyPos(3)->DataType().Length(), 9);
+}
+
+TEST(HostRecordList, AddRecordCopiesAndPlaces) {
+    ZrRecordList list;
+    ZrRecord* empty = list.AddRecord(nullptr, -1);
+    ASSERT_NE(empty, nullptr);
+    EXPECT_EQ(empty->FieldCount(), 0);
+    EXPECT_TRUE(empty->name.empty());
+    {
+        const ZrRecord source = makeRecord(u"b", {u"x"});
+        ZrRecord* held = list.AddRecord(&source, -1);
+        ASSERT_NE(held, nullptr);
+        EXPECT_NE(held, &source);
+    }
+    // The copy outlives its source.
+    EXPECT_EQ(fieldNames(*list[u"b"]), u"x;");
+
+    const ZrRecord front = makeRecord(u"a", {});
+    const ZrRecord back = makeRecord(u"c", {});
+    list.AddRecord(&front, 0);
+    list.AddRecord(&back, 99);
+    std::u16string order;
+    for (int i = 0; i < list.Count(); ++i)
+        order += list[i]->name.str() + u";";
+    EXPECT_EQ(order, u"a;;b;c;");
+
+    EXPECT_EQ(list[-1], nullptr);
+    EXPECT_EQ(list[list.Count()], nullptr);
+    EXPECT_EQ(list[u"B"], nullptr) << "names compare exactly";
+    list.AddRecord(&back, -1);
+    EXPECT_EQ(list[u"c"], list[3]) << "the first of two records with one name";
+
+    ZrRecordList copy(list);
+    list.Clear();
+    EXPECT_EQ(list.Count(), 0);
+    ASSERT_EQ(copy.Count(), 5);
+    EXPECT_EQ(fieldNames(*copy[u"b"]), u"x;");
+    ZrRecordList assigned;
+    assigned = copy;
+    copy[u"b"]->name = u"renamed";
+    EXPECT_NE(assigned[u"b"], nullptr);
+}
+
+// A browser with two options: one served by narrow callbacks, one by wide ones.
+class OptionBrowser : public ZrDictBrowser {
+  public:
+    OptionBrowser() : ZrDictBrowser(nullptr, kDefs) { InitOptions(); }
+
+    BATCHERR ReadDictionary(const char*) override { return BE_OK; }
+
+    int OptionDefCount() const override { return 2; }
+
+    const ZrOptionDef** GetOptionDefs() const override { return defs; }
+
+    std::string narrowValue;
+    std::u16string wideValue;
+    std::vector<std::u16string> names; // the `name` each callback received
+
+    static const char* const kDefs[];
+
+  private:
+    static OptionBrowser* self(void* owner) {
+        return static_cast<OptionBrowser*>(static_cast<ZrDictBrowser*>(owner));
+    }
+
+    static BATCHERR getNarrow(void* owner, ZrString& value, const ZrWChar* name) {
+        self(owner)->names.push_back(name);
+        value = self(owner)->narrowValue.c_str();
+        return BE_OK;
+    }
+
+    static BATCHERR setNarrow(void* owner, const char* value, bool& changed, const ZrWChar* name) {
+        self(owner)->names.push_back(name);
+        changed = self(owner)->narrowValue != value;
+        self(owner)->narrowValue = value;
+        return BE_OK;
+    }
+
+    static BATCHERR getWide(void* owner, ZrWString& value, const ZrWChar*) {
+        value = self(owner)->wideValue.c_str();
+        return BE_OK;
+    }
+
+    static BATCHERR setWide(void* owner, const ZrWChar* value, bool&, const ZrWChar*) {
+        self(owner)->wideValue = value;
+        return BE_OK;
+    }
+
+    const ZrOptionDef narrowDef{
+        u"narrowoption", u"NarrowOption", u"narrow", 0, "Start", nullptr, getNarrow, setNarrow,
+        nullptr,         nullptr,         nullptr,   0, nullptr, nullptr, 0,         0};
+    const ZrOptionDef wideDef{u"wideoption", u"WideOption", u"wide", 0,       "Grüße", nullptr,
+                              nullptr,       nullptr,       getWide, setWide, nullptr, 0,
+                              nullptr,       nullptr,       0,       0};
+    mutable const ZrOptionDef* defs[3] = {&narrowDef, &wideDef, nullptr};
+};
+
+const char* const OptionBrowser::kDefs[] = {"Text;alias=x;usage=0", nullptr};
+
+TEST(HostOptions, InitOptionsAppliesDefaults) {
+    OptionBrowser browser;
+    EXPECT_EQ(browser.narrowValue, "Start");
+    EXPECT_EQ(browser.wideValue, u"Grüße");
+    EXPECT_EQ(browser.TypeDefinitions(), OptionBrowser::kDefs);
+}
+
+TEST(HostOptions, FindsByKeyOrNameCaseBlind) {
+    OptionBrowser browser;
+    const ZrOptionDef* narrow = browser.GetOptionDefs()[0];
+    for (const char16_t* name :
+         {u"narrowoption", u"NarrowOption", u"NARROWOPTION", u"nArRoWoPtIoN"})
+        EXPECT_EQ(browser.FindOptionDef(name), narrow) << zrUtf16ToUtf8(name);
+    EXPECT_EQ(browser.FindOptionDef(u"WIDEOPTION"), browser.GetOptionDefs()[1]);
+    EXPECT_EQ(browser.FindOptionDef(u"narrow"), nullptr);
+    EXPECT_EQ(browser.FindOptionDef(u""), nullptr);
+    EXPECT_EQ(browser.FindOptionDef(nullptr), nullptr);
+}
+
+TEST(HostOptions, GetAndSetThroughCallbacks) {
+    OptionBrowser browser;
+    browser.names.clear();
+    EXPECT_EQ(browser.SetOption(u"NARROWOPTION", u"caf\u00E9"), BE_OK);
+    EXPECT_EQ(browser.narrowValue, "café") << "the narrow setter gets UTF-8";
+    ZrWString value;
+    EXPECT_EQ(browser.GetOption(u"narrowOption", value), BE_OK);
+    EXPECT_EQ(value.str(), u"caf\u00E9");
+    EXPECT_EQ(browser.names, (std::vector<std::u16string>{u"narrowoption", u"narrowoption"}));
+
+    EXPECT_EQ(browser.SetOption(u"wideoption", u"\U0001F600"), BE_OK);
+    EXPECT_EQ(browser.wideValue, u"\U0001F600");
+    EXPECT_EQ(browser.GetOption(u"WideOption", value), BE_OK);
+    EXPECT_EQ(value.str(), u"\U0001F600");
+
+    EXPECT_EQ(browser.SetOption(u"unknown", u"x"), BE_UNKNOWN_OPTION);
+    EXPECT_EQ(browser.GetOption(u"unknown", value), BE_UNKNOWN_OPTION);
+    EXPECT_NE(BE_UNKNOWN_OPTION, BE_OK);
+}
+
+TEST(HostOptions, LoadOptionsAppliesNameValueLines) {
+    OptionBrowser browser;
+    ZrString text("# comment\r\n"
+                  "; NarrowOption=ignored\n"
+                  "\n"
+                  "Unknown=skipped\n"
+                  "no equals sign\n"
+                  "  narrowoption =  a=b  \r\n"
+                  "WideOption=w");
+    browser.LoadOptions(text);
+    EXPECT_EQ(browser.narrowValue, "a=b");
+    EXPECT_EQ(browser.wideValue, u"w");
+}
+
+// The base alone: no options, no flattening.
+class BareBrowser : public ZrDictBrowser {
+  public:
+    BareBrowser() : ZrDictBrowser(&spoke, nullptr) { InitOptions(); }
+
+    BATCHERR ReadDictionary(const char*) override { return BE_OK; }
+
+    ZrSpoke spoke;
+};
+
+TEST(HostOptions, BaseHasNoOptionsAndNoFlattening) {
+    BareBrowser browser;
+    EXPECT_EQ(browser.OptionDefCount(), 0);
+    EXPECT_EQ(browser.GetOptionDefs(), nullptr);
+    EXPECT_EQ(browser.FindOptionDef(u"x"), nullptr);
+    ZrWString value;
+    EXPECT_EQ(browser.GetOption(u"x", value), BE_UNKNOWN_OPTION);
+    ZrString text("x=1");
+    browser.LoadOptions(text);
+    ZrRecord source, target;
+    EXPECT_EQ(browser.FlattenDictRecord(&source, &target, nullptr), BE_INVALID_ARGUMENT);
+    EXPECT_EQ(browser.Spoke(), &browser.spoke);
+}
+
+TEST(HostBrowser, CopyCarriesRecordsAndSpoke) {
+    BareBrowser browser;
+    const ZrRecord record = makeRecord(u"r", {u"f"});
+    browser.RecordList().AddRecord(&record, -1);
+    BareBrowser copy(browser);
+    browser.RecordList().Clear();
+    ASSERT_EQ(copy.RecordList().Count(), 1);
+    EXPECT_EQ(fieldNames(*copy.RecordList()[0]), u"f;");
+    EXPECT_EQ(copy.Spoke(), &browser.spoke);
+
+    ZrDType type = textType(4);
+    const ZrDType mapped = browser.spoke.MapDataType(type);
+    EXPECT_STREQ(mapped.Alias(), "string");
+    EXPECT_EQ(mapped.Length(), 4);
+}
+
+} // namespace

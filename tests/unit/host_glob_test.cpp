@@ -1,0 +1,220 @@
+// Host services: message formatting and delivery, case-blind comparison, boolean
+// texts, file-name splitting and joining, parser-text copies.
+#include "TestSupport.h"
+#include "zrglob.h"
+
+#include <climits>
+#include <functional>
+#include <gtest/gtest.h>
+#include <string>
+
+namespace {
+
+using zrtest::LogCapture;
+
+// Formats through the narrow LogMessage and returns the delivered text.
+template <typename... Args> std::string narrowFormat(const char* format, Args... args) {
+    LogCapture log;
+    ZrGlob::LogMessage(ZR_SEV_NOTICE, 0, format, args...);
+    return log.messages.size() == 1 ? log.messages[0].text : "<not one message>";
+}
+
+template <typename... Args> std::string wideFormat(const char16_t* format, Args... args) {
+    ZrWString out;
+    const int length = wsfmt(out, format, args...);
+    EXPECT_EQ(length, out.length());
+    return zrUtf16ToUtf8(out.view());
+}
+
+struct FormatCase {
+    const char* name;
+    std::function<std::string()> format;
+    const char* expected;
+};
+
+const char16_t* const kNullWide = nullptr;
+const char* const kNullNarrow = nullptr;
+
+const FormatCase kFormatCases[] = {
+    {"NarrowPercentS", [] { return narrowFormat("a %s b", "Grüße"); }, "a Grüße b"},
+    {"NarrowPercentCapitalSIsWide", [] { return narrowFormat("<%S>", u"wide\u00E9"); }, "<wideé>"},
+    {"NarrowNullTexts", [] { return narrowFormat("%s %S", kNullNarrow, kNullWide); },
+     "(null) (null)"},
+    {"NarrowUtf8Literal", [] { return narrowFormat("é %d €", 5); }, "é 5 €"},
+    {"WidePercentSIsWide", [] { return wideFormat(u"[%s]", u"x\u00E9"); }, "[xé]"},
+    {"WidePercentCapitalSIsNarrow", [] { return wideFormat(u"[%S]", "Grüße"); }, "[Grüße]"},
+    {"WideNullTexts", [] { return wideFormat(u"%s|%S", kNullWide, kNullNarrow); }, "(null)|(null)"},
+    {"Integers", [] { return narrowFormat("%d %d %ld %u", -7, INT_MAX, LONG_MIN, UINT_MAX); },
+     "-7 2147483647 -9223372036854775808 4294967295"},
+    {"WideIntegers", [] { return wideFormat(u"%d/%ld/%u", INT_MIN, 12L, 3u); }, "-2147483648/12/3"},
+    {"Characters", [] { return narrowFormat("%c%c%c", 'A', 0xE9, static_cast<char>(0xE9)); },
+     "Aéé"},
+    {"WideCharacter", [] { return wideFormat(u"%c!", int(u'\u20AC')); }, "€!"},
+    {"PercentSign", [] { return narrowFormat("100%% of %d", 3); }, "100% of 3"},
+    {"WidePercentSign", [] { return wideFormat(u"%%s"); }, "%s"},
+    {"UnknownConversionConsumesNothing", [] { return narrowFormat("%q %d", 5); }, "%q 5"},
+    {"TrailingPercent", [] { return narrowFormat("50%"); }, "50%"},
+    {"WidthAndPrecision",
+     [] { return narrowFormat("[%5d][%-4s][%.2s][%03d]", 42, "ab", "xyz", -5); },
+     "[   42][ab  ][xy][-05]"},
+    {"MessageFormats",
+     [] {
+         return wideFormat(u"Schema: Error: At line %d, column %d of file %s: %s", 3, 5, u"a.xsd",
+                           u" bad");
+     },
+     "Schema: Error: At line 3, column 5 of file a.xsd:  bad"},
+};
+
+class Formatting : public ::testing::TestWithParam<FormatCase> {};
+
+TEST_P(Formatting, Substitutes) { EXPECT_EQ(GetParam().format(), GetParam().expected); }
+
+INSTANTIATE_TEST_SUITE_P(Host, Formatting, ::testing::ValuesIn(kFormatCases),
+                         [](const auto& i) { return std::string(i.param.name); });
+
+TEST(HostLog, DeliversSeverityAndCodeToSink) {
+    LogCapture log;
+    ZrGlob::LogMessage(ZR_SEV_ERROR, 19, u"%s", lgettext(u"wide"));
+    ZrGlob::LogMessage(ZR_SEV_WARNING, 4, "narrow");
+    EXPECT_EQ(log.lines(), "4 19 wide\n2 4 narrow\n");
+}
+
+TEST(HostLog, WithoutSinkWritesOneLineToStderr) {
+    ZrLogSink previous = ZrGlob::SetLogSink(nullptr);
+    ::testing::internal::CaptureStderr();
+    ZrGlob::LogMessage(ZR_SEV_FATAL, 4, "broken %s", "doc");
+    ZrGlob::LogMessage(7, 0, u"odd");
+    const std::string err = ::testing::internal::GetCapturedStderr();
+    ZrGlob::SetLogSink(previous);
+    EXPECT_EQ(err, "fatal 4: broken doc\nseverity 7 0: odd\n");
+}
+
+TEST(HostLog, SetLogSinkReturnsThePreviousSink) {
+    int calls = 0;
+    ZrLogSink counting = [&calls](int, int, const std::u16string&) { ++calls; };
+    ZrLogSink before = ZrGlob::SetLogSink(counting);
+    ZrGlob::LogMessage(ZR_SEV_NOTICE, 0, "x");
+    ZrLogSink returned = ZrGlob::SetLogSink(before);
+    ASSERT_TRUE(returned);
+    returned(0, 0, u"");
+    EXPECT_EQ(calls, 2);
+}
+
+TEST(HostGlob, SeverityWords) {
+    EXPECT_EQ(ZrGlob::SeverityWord(2), "warning");
+    EXPECT_EQ(ZrGlob::SeverityWord(4), "error");
+    EXPECT_EQ(ZrGlob::SeverityWord(8), "fatal");
+    EXPECT_EQ(ZrGlob::SeverityWord(512), "notice");
+    EXPECT_EQ(ZrGlob::SeverityWord(3), "severity 3");
+}
+
+TEST(HostGlob, CaseBlindCompare) {
+    EXPECT_EQ(ZrGlob::wcscmpi(u"FaLsE", u"false"), 0);
+    EXPECT_EQ(ZrGlob::wcscmpi(u"\u00C9t\u00C9", u"\u00E9t\u00E9"), 0);
+    // The multiplication and division signs are not a case pair.
+    EXPECT_NE(ZrGlob::wcscmpi(u"\u00D7", u"\u00F7"), 0);
+    EXPECT_EQ(ZrGlob::wcscmpi(nullptr, u""), 0);
+    EXPECT_LT(ZrGlob::wcscmpi(u"abc", u"ABD"), 0);
+    EXPECT_GT(ZrGlob::wcscmpi(u"abcd", u"ABC"), 0);
+    EXPECT_LT(ZrGlob::wcscmpi(nullptr, u"a"), 0);
+}
+
+struct BoolCase {
+    const char* value;
+    const char* picture;
+    bool expected;
+};
+
+const BoolCase kBoolCases[] = {
+    {"True", "True.False.true.false", true},
+    {" true\t", "True.False.true.false", true},
+    {"TRUE", "True.False.true.false", true},
+    {"False", "True.False.true.false", false},
+    {"1", "True.False.true.false", false},
+    {"", "True.False.true.false", false},
+    {"yes", "True.False.true.false", false},
+    {nullptr, "True.False.true.false", false},
+    {"1", "true.false.1.0", true},
+    {"0", "true.false.1.0", false},
+    {"false", "false.true", true},
+    {"true", "false.true", false},
+    {"True", nullptr, true},
+    {"Tru", "True.False", false},
+};
+
+TEST(HostGlob, StrToBoolAndBack) {
+    for (const auto& c : kBoolCases)
+        EXPECT_EQ(ZrGlob::StrToBool(c.value, c.picture), c.expected)
+            << (c.value ? c.value : "(null)") << " / " << (c.picture ? c.picture : "(null)");
+    EXPECT_STREQ(ZrGlob::BoolToStr(true), "True");
+    EXPECT_STREQ(ZrGlob::BoolToStr(false), "False");
+    EXPECT_TRUE(ZrGlob::StrToBool(ZrGlob::BoolToStr(true), "True.False.true.false"));
+    EXPECT_FALSE(ZrGlob::StrToBool(ZrGlob::BoolToStr(false), "True.False.true.false"));
+}
+
+struct PathCase {
+    const char* path;
+    const char* dir;
+    const char* name;
+    const char* ext;
+};
+
+const PathCase kPathCases[] = {
+    {"a/b.c.xsd", "a/", "b.c", ".xsd"},
+    {"b.xsd", "", "b", ".xsd"},
+    {"dir\\sub\\x.xsd", "dir\\sub\\", "x", ".xsd"},
+    {"C:\\x/y\\z.xsd", "C:\\x/y\\", "z", ".xsd"},
+    {"/abs/name", "/abs/", "name", ""},
+    {"a.d/name", "a.d/", "name", ""},
+    {"dir/.hidden", "dir/", ".hidden", ""},
+    {"dir/x.", "dir/", "x", "."},
+    {"dir/", "dir/", "", ""},
+    {"", "", "", ""},
+};
+
+TEST(HostGlob, SepfileSplitsAndJoinsBack) {
+    for (const auto& c : kPathCases) {
+        ZrString path(c.path), name("junk"), ext("junk");
+        ZrGlob::sepfile(path, name, ext);
+        EXPECT_STREQ(path.c_str(), c.dir) << c.path;
+        EXPECT_STREQ(name.c_str(), c.name) << c.path;
+        EXPECT_STREQ(ext.c_str(), c.ext) << c.path;
+        ZrGlob::appndnam(path, name.c_str());
+        ZrGlob::appndext(path, ext.c_str());
+        EXPECT_STREQ(path.c_str(), c.path) << "round trip";
+    }
+}
+
+TEST(HostGlob, AppendsSeparatorAndDot) {
+    ZrString path("dir");
+    ZrGlob::appndnam(path, "x");
+    ZrGlob::appndext(path, "xsd");
+    EXPECT_STREQ(path.c_str(), "dir/x.xsd");
+
+    ZrString windows("C:\\dir");
+    ZrGlob::appndnam(windows, "x");
+    EXPECT_STREQ(windows.c_str(), "C:\\dir\\x");
+
+    ZrString empty;
+    ZrGlob::appndnam(empty, "x");
+    ZrGlob::appndext(empty, nullptr);
+    ZrGlob::appndext(empty, "");
+    EXPECT_STREQ(empty.c_str(), "x");
+}
+
+TEST(HostGlob, ParserTextCopies) {
+    ZrWString out(u"old");
+    ZrXmlUtils::XMLChToWchar(u" \t\r\n a b \n", out, true);
+    EXPECT_EQ(out.str(), u"a b");
+    ZrXmlUtils::XMLChToWchar(u" a ", out, false);
+    EXPECT_EQ(out.str(), u" a ");
+    ZrXmlUtils::XMLChToWchar(u" \n ", out, true);
+    EXPECT_EQ(out.str(), u"");
+    ZrXmlUtils::XMLChToWchar(nullptr, out, true);
+    EXPECT_EQ(out.str(), u"");
+    EXPECT_EQ(ZrXmlUtils::XMLChToWchar(u"x y").str(), u"x y");
+    const char16_t* key = u"key";
+    EXPECT_EQ(lgettext(key), key);
+}
+
+} // namespace

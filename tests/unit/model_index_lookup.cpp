@@ -1,0 +1,472 @@
+// The model's lookups by name go through an index; they must answer exactly what a
+// first-match scan of the list from its start answers. Checked directly on
+// NamedList against a plain scan, and on whole reads of schemas built to trip an
+// index: names repeated across namespaces and within one, "anon" names, groups
+// and types sharing a name, a temporary entry pushed and popped while records are
+// built.
+#include "TestSupport.h"
+#include "dictionary_support.h"
+
+#include <gtest/gtest.h>
+#include <ostream>
+#include <random>
+#include <set>
+#include <string>
+#include <utility>
+#include <vector>
+
+namespace {
+
+using zrtest::LogCapture;
+using zrtest::TempDir;
+using zrtest::utf8;
+using zrtest::wide;
+
+// The lookup rule written out as a scan: the first entry whose name equals the
+// one sought and, unless that name begins with "anon", whose namespace does too.
+bool beginsWithAnon(std::u16string_view name) {
+    return name.size() >= 4 && name[0] == u'a' && name[1] == u'n' && name[2] == u'o' &&
+           name[3] == u'n';
+}
+
+template <class T>
+const T* scanFind(const NamedList<T>& list, std::u16string_view name, std::u16string_view ns) {
+    for (const T& item : list)
+        if (item.name.view() == name && (beginsWithAnon(name) || item.nameNs.view() == ns))
+            return &item;
+    return nullptr;
+}
+
+template <class T>
+const T* scanFindExact(const NamedList<T>& list, std::u16string_view name, std::u16string_view ns) {
+    for (const T& item : list)
+        if (item.name.view() == name && item.nameNs.view() == ns)
+            return &item;
+    return nullptr;
+}
+
+struct Entry {
+    ZrWString name;
+    ZrWString nameNs;
+    int id = -1;
+};
+
+// Ids of what find and findExact return, -1 for none.
+int idOf(const Entry* e) { return e ? e->id : -1; }
+
+// --- NamedList against the scan, case by case ------------------------------------------
+
+struct Step {
+    enum Kind { Push, Pop, Find, FindExact } kind;
+
+    const char16_t* name = u"";
+    const char16_t* ns = u"";
+    int id = -1; // Push: the new entry's id; Find*: the id expected, -1 for none
+};
+
+Step push(const char16_t* name, const char16_t* ns, int id) { return {Step::Push, name, ns, id}; }
+
+Step pop() { return {Step::Pop}; }
+
+Step find(const char16_t* name, const char16_t* ns, int id) { return {Step::Find, name, ns, id}; }
+
+Step exact(const char16_t* name, const char16_t* ns, int id) {
+    return {Step::FindExact, name, ns, id};
+}
+
+struct ListCase {
+    const char* label;
+    std::vector<Step> steps;
+};
+
+const ListCase kListCases[] = {
+    {"SameNameInThreeNamespaces",
+     {push(u"Party", u"urn:a", 0), push(u"Party", u"urn:b", 1), push(u"Party", u"", 2),
+      find(u"Party", u"urn:b", 1), find(u"Party", u"", 2), find(u"Party", u"urn:a", 0),
+      find(u"Party", u"urn:c", -1), exact(u"Party", u"urn:b", 1), exact(u"Party", u"urn:c", -1)}},
+    {"GeneratedNamesIgnoreTheNamespaceSought",
+     {push(u"anon3", u"urn:a", 0), push(u"anon3", u"", 1), find(u"anon3", u"urn:zzz", 0),
+      find(u"anon3", u"", 0), exact(u"anon3", u"", 1), exact(u"anon3", u"urn:b", -1),
+      find(u"anon4", u"", -1)}},
+    {"AuthorNamesBeginningWithAnonFollowTheSameRule",
+     {push(u"anonymousParty", u"urn:a", 0), push(u"anon", u"urn:a", 1),
+      find(u"anonymousParty", u"urn:b", 0), find(u"anon", u"", 1),
+      exact(u"anonymousParty", u"urn:b", -1)}},
+    {"NamesThatOnlyLookLikeAnonNeedTheirNamespace",
+     {push(u"ano", u"urn:a", 0), push(u"Anon1", u"urn:a", 1), push(u"xanon", u"urn:a", 2),
+      find(u"ano", u"urn:b", -1), find(u"Anon1", u"urn:b", -1), find(u"xanon", u"", -1),
+      find(u"Anon1", u"urn:a", 1)}},
+    {"TypeDefinedTwiceFindsTheFirst",
+     {push(u"Dup", u"urn:a", 0), push(u"Other", u"urn:a", 1), push(u"Dup", u"urn:a", 2),
+      find(u"Dup", u"urn:a", 0), exact(u"Dup", u"urn:a", 0)}},
+    {"PopOfALaterDuplicateKeepsTheEarlierMatch",
+     {push(u"Dup", u"urn:a", 0), push(u"Dup", u"urn:a", 1), pop(), find(u"Dup", u"urn:a", 0),
+      push(u"anon7", u"urn:a", 2), push(u"anon7", u"", 3), pop(), find(u"anon7", u"", 2),
+      exact(u"anon7", u"", -1), exact(u"anon7", u"urn:a", 2)}},
+    {"PopOfTheFirstMatchForgetsItAndANewPushIsFound",
+     {push(u"T", u"urn:a", 0), pop(), find(u"T", u"urn:a", -1), push(u"T", u"urn:a", 1),
+      find(u"T", u"urn:a", 1), push(u"anon1", u"", 2), pop(), find(u"anon1", u"urn:x", -1),
+      push(u"anon1", u"urn:q", 3), find(u"anon1", u"", 3)}},
+    {"TemporaryGeneratedEntryPushedAndPopped",
+     // Record building appends a copy under a fresh generated name, looks it up,
+     // and removes it; an author's type of that name stays the answer throughout.
+     {push(u"anon1", u"urn:a", 0), push(u"Code", u"urn:a", 1), push(u"anon1", u"", 2),
+      find(u"anon1", u"", 0), pop(), find(u"anon1", u"", 0), push(u"anon2", u"", 3),
+      find(u"anon2", u"urn:a", 3), pop(), find(u"anon2", u"", -1), find(u"Code", u"urn:a", 1)}},
+    {"NameAndNamespaceDoNotRunTogether",
+     {push(u"ab", u"urn:", 0), push(u"b", u"urn:a", 1), find(u"b", u"urn:a", 1),
+      find(u"ab", u"urn:", 0), find(u"b", u"urn:", -1), find(u"rn:ab", u"u", -1)}},
+    {"EmptyNames",
+     // Group references stand in the list of top-level declarations with no name.
+     {push(u"", u"", 0), push(u"", u"", 1), push(u"", u"urn:a", 2), find(u"", u"", 0),
+      exact(u"", u"urn:a", 2), find(u"", u"urn:b", -1)}},
+};
+
+void PrintTo(const ListCase& c, std::ostream* os) { *os << c.label; }
+
+class NamedListCases : public ::testing::TestWithParam<ListCase> {};
+
+TEST_P(NamedListCases, AnswerLikeAScan) {
+    NamedList<Entry> list;
+    int stepNo = 0;
+    for (const Step& step : GetParam().steps) {
+        SCOPED_TRACE("step " + std::to_string(stepNo++));
+        switch (step.kind) {
+        case Step::Push:
+            list.push_back(Entry{ZrWString(step.name), ZrWString(step.ns), step.id});
+            break;
+        case Step::Pop:
+            list.pop_back();
+            break;
+        case Step::Find:
+            EXPECT_EQ(idOf(list.find(step.name, step.ns)), step.id);
+            EXPECT_EQ(idOf(scanFind(list, step.name, step.ns)), step.id) << "the case itself";
+            break;
+        case Step::FindExact:
+            EXPECT_EQ(idOf(list.findExact(step.name, step.ns)), step.id);
+            EXPECT_EQ(idOf(scanFindExact(list, step.name, step.ns)), step.id) << "the case itself";
+            break;
+        }
+    }
+}
+
+INSTANTIATE_TEST_SUITE_P(Lookups, NamedListCases, ::testing::ValuesIn(kListCases),
+                         [](const auto& row) { return std::string(row.param.label); });
+
+// A group definition and a complex type share one list and one name: whichever
+// ended first is found, by either kind of reference.
+TEST(NamedListLookups, GroupAndTypeSharingANameFindWhicheverCameFirst) {
+    for (bool groupFirst : {true, false}) {
+        NamedList<ComplexTypeDef> list;
+        ComplexTypeDef type;
+        type.name = u"Shared";
+        type.nameNs = u"urn:a";
+        ComplexTypeDef group = type;
+        group.isGroup = true;
+        list.push_back(groupFirst ? group : type);
+        list.push_back(groupFirst ? type : group);
+        ASSERT_NE(list.find(u"Shared", u"urn:a"), nullptr);
+        EXPECT_EQ(list.find(u"Shared", u"urn:a")->isGroup, groupFirst);
+        EXPECT_EQ(list.findExact(u"Shared", u"urn:a"), &list[0]);
+    }
+}
+
+// Random pushes, pops and clears over a small pool of colliding names; after every
+// operation every name of the pool, in every namespace, is looked up both ways.
+TEST(NamedListLookups, RandomOperationsAnswerLikeAScan) {
+    const std::u16string names[] = {u"T",     u"U",   u"anon0", u"anon1",     u"anonX",
+                                    u"Anon0", u"ano", u"",      u"anonymousT"};
+    const std::u16string spaces[] = {u"", u"urn:a", u"urn:b"};
+    for (unsigned seed : {1u, 2u, 3u, 4u}) {
+        std::mt19937 rng(seed);
+        NamedList<Entry> list;
+        int nextId = 0;
+        for (int op = 0; op < 1500; ++op) {
+            const unsigned roll = rng() % 100;
+            if (roll < 2) {
+                list.clear();
+            } else if (roll < 30 && !list.empty()) {
+                list.pop_back();
+            } else {
+                list.push_back(Entry{ZrWString(names[rng() % std::size(names)]),
+                                     ZrWString(spaces[rng() % std::size(spaces)]), nextId++});
+            }
+            for (const auto& name : names) {
+                for (const auto& ns : spaces) {
+                    ASSERT_EQ(idOf(list.find(name, ns)), idOf(scanFind(list, name, ns)))
+                        << "seed " << seed << " op " << op << " find " << utf8(name) << " in '"
+                        << utf8(ns) << "'";
+                    ASSERT_EQ(idOf(list.findExact(name, ns)), idOf(scanFindExact(list, name, ns)))
+                        << "seed " << seed << " op " << op << " findExact " << utf8(name) << " in '"
+                        << utf8(ns) << "'";
+                }
+            }
+        }
+    }
+}
+
+// --- whole reads ----------------------------------------------------------------------
+
+// Every lookup record building can make on the model of a finished read (each name
+// a component or declaration refers to, and each component's own name asked in
+// every namespace of the read) gives the entry a scan gives. Record building only
+// looks names up in these lists, so the read's records are those a scanning
+// reader would build.
+void expectLookupsAgreeWithScans(ZrXmlSchemaBrowserTestAccess& access) {
+    auto& complexTypes = access.complexTypes();
+    auto& simpleTypes = access.simpleTypes();
+    auto& globals = access.globalElements();
+
+    std::set<std::u16string> names;
+    std::set<std::u16string> spaces{u""};
+    std::set<std::pair<std::u16string, std::u16string>> keys;
+    auto addKey = [&](const ZrWString& name, const ZrWString& ns) {
+        names.insert(name.str());
+        spaces.insert(ns.str());
+        keys.emplace(name.str(), ns.str());
+    };
+    auto addDeclaration = [&](const ElementDef& e) {
+        addKey(e.typeName, e.typeNs);
+        addKey(e.refName, e.refNs);
+        addKey(e.groupName, e.groupNs);
+        addKey(e.name, e.nameNs);
+    };
+    for (const ElementDef& e : globals)
+        addDeclaration(e);
+    for (const ComplexTypeDef& t : complexTypes) {
+        addKey(t.name, t.nameNs);
+        addKey(t.baseName, t.baseNs);
+        for (const ElementDef& e : t.content)
+            addDeclaration(e);
+    }
+    for (const SimpleTypeDef& t : simpleTypes) {
+        addKey(t.name, t.nameNs);
+        addKey(t.baseName, t.baseNs);
+    }
+    // Each name once more in every namespace seen: a lookup may carry any of them.
+    for (const auto& name : names)
+        for (const auto& ns : spaces)
+            keys.emplace(name, ns);
+
+    for (const auto& [name, ns] : keys) {
+        const std::u16string_view n = name;
+        const std::u16string_view s = ns;
+        ASSERT_EQ(complexTypes.find(n, s), scanFind(complexTypes, n, s))
+            << "complex type " << utf8(name) << " in '" << utf8(ns) << "'";
+        ASSERT_EQ(simpleTypes.find(n, s), scanFind(simpleTypes, n, s))
+            << "simple type " << utf8(name) << " in '" << utf8(ns) << "'";
+        ASSERT_EQ(globals.findExact(n, s), scanFindExact(globals, n, s))
+            << "global declaration " << utf8(name) << " in '" << utf8(ns) << "'";
+        ASSERT_EQ(complexTypes.findExact(n, s), scanFindExact(complexTypes, n, s));
+        ASSERT_EQ(simpleTypes.findExact(n, s), scanFindExact(simpleTypes, n, s));
+        ASSERT_EQ(globals.find(n, s), scanFind(globals, n, s));
+    }
+}
+
+// The main document is in urn:a; the part it includes switches the target namespace
+// to urn:b, which therefore holds while records are built: names in urn:a carry the
+// prefix a, names in urn:b none.
+constexpr const char* kStressMain = R"(<?xml version="1.0"?>
+<xs:schema xmlns:xs="http://www.w3.org/2001/XMLSchema" xmlns:a="urn:a" xmlns:b="urn:b"
+           targetNamespace="urn:a">
+  <xs:include schemaLocation="part.xsd"/>
+  <xs:complexType name="Dup"><xs:sequence>
+    <xs:element name="first" type="xs:int"/>
+  </xs:sequence></xs:complexType>
+  <xs:complexType name="Dup"><xs:sequence>
+    <xs:element name="second" type="xs:int"/>
+  </xs:sequence></xs:complexType>
+  <xs:group name="Shared"><xs:sequence>
+    <xs:element name="fromGroupA" type="xs:string"/>
+  </xs:sequence></xs:group>
+  <xs:complexType name="Shared"><xs:sequence>
+    <xs:element name="fromTypeA" type="xs:string"/>
+  </xs:sequence></xs:complexType>
+  <xs:simpleType name="Code"><xs:restriction base="xs:string">
+    <xs:maxLength value="3"/>
+  </xs:restriction></xs:simpleType>
+  <xs:complexType name="anonymousParty"><xs:sequence>
+    <xs:element name="partyId" type="xs:string"/>
+  </xs:sequence></xs:complexType>
+  <xs:simpleType name="anon1"><xs:restriction base="xs:string">
+    <xs:maxLength value="9"/>
+  </xs:restriction></xs:simpleType>
+  <xs:complexType name="Money"><xs:simpleContent><xs:extension base="xs:decimal">
+    <xs:attribute name="currency" type="a:Code"/>
+  </xs:extension></xs:simpleContent></xs:complexType>
+  <xs:element name="root"><xs:complexType><xs:sequence>
+    <xs:element name="dup" type="a:Dup"/>
+    <xs:element name="sharedA" type="a:Shared"/>
+    <xs:group ref="a:Shared"/>
+    <xs:element name="sharedB" type="b:Shared"/>
+    <xs:group ref="b:Shared"/>
+    <xs:element name="codeA" type="a:Code"/>
+    <xs:element name="codeB" type="b:Code"/>
+    <xs:element name="party" type="b:anonymousParty"/>
+    <xs:element name="price" type="a:Money"/>
+    <xs:element name="tax" type="a:Money"/>
+    <xs:element name="later" type="a:anon1"/>
+    <xs:element ref="b:item"/>
+    <xs:element ref="a:item"/>
+  </xs:sequence></xs:complexType></xs:element>
+  <xs:element name="item" type="xs:int"/>
+  <xs:element name="item" type="xs:string"/>
+</xs:schema>
+)";
+
+constexpr const char* kStressPart = R"(<?xml version="1.0"?>
+<xs:schema xmlns:xs="http://www.w3.org/2001/XMLSchema" targetNamespace="urn:b">
+  <xs:complexType name="Shared"><xs:sequence>
+    <xs:element name="fromTypeB" type="xs:string"/>
+  </xs:sequence></xs:complexType>
+  <xs:group name="Shared"><xs:sequence>
+    <xs:element name="fromGroupB" type="xs:string"/>
+  </xs:sequence></xs:group>
+  <xs:simpleType name="Code"><xs:restriction base="xs:string">
+    <xs:maxLength value="7"/>
+  </xs:restriction></xs:simpleType>
+  <xs:complexType name="Dup"><xs:sequence>
+    <xs:element name="inB" type="xs:int"/>
+  </xs:sequence></xs:complexType>
+  <xs:element name="item" type="xs:date"/>
+</xs:schema>
+)";
+
+// Derived by hand from the lookup rule:
+// - a:Dup is defined twice: the first definition (field first) is used;
+// - a:Shared names a group that ended before the type of that name, b:Shared a type
+//   that ended before the group: both references find the earlier one;
+// - b:anonymousParty finds the type of urn:a, since the name begins with "anon";
+// - price has simple content: its text field's type is looked up under the next
+//   generated name, anon1 (anon0 is root's type), which the author's simple type
+//   anon1 already holds, so the field is that type's string of 9; the temporary
+//   entry is removed again, so later (typed a:anon1) sees the author's type too;
+// - tax, the next simple-content record, gets anon2, its own copy: decimal;
+// - b:item and a:item: the urn:b declaration (a date) and the first urn:a one (int).
+constexpr const char* kStressRecords = "a:root(0):\n"
+                                       "  a:dup: Record(2) 0/0/0 notnull\n"
+                                       "  a:sharedA: Record(2) 0/0/0 notnull\n"
+                                       "  a:fromGroupA: string(16) 0/0/0 null\n"
+                                       "  a:sharedB: Record(2) 0/0/0 notnull\n"
+                                       "  fromTypeB: string(16) 0/0/0 null\n"
+                                       "  a:codeA: string(16) 3/0/0 null\n"
+                                       "  a:codeB: string(16) 7/0/0 null\n"
+                                       "  a:party: Record(2) 0/0/0 notnull\n"
+                                       "  a:price: Record(2) 0/0/0 notnull\n"
+                                       "  a:tax: Record(2) 0/0/0 notnull\n"
+                                       "  a:later: string(16) 9/0/0 null\n"
+                                       "  item: date(57) 0/0/0 null\n"
+                                       "  a:item: int(48) 0/10/0 null\n"
+                                       "a:dup(0):\n"
+                                       "  a:first: int(48) 0/10/0 null\n"
+                                       "a:sharedA(0):\n"
+                                       "  a:fromGroupA: string(16) 0/0/0 null\n"
+                                       "a:sharedB(0):\n"
+                                       "  fromTypeB: string(16) 0/0/0 null\n"
+                                       "a:party(0):\n"
+                                       "  a:partyId: string(16) 0/0/0 null\n"
+                                       "a:price(0):\n"
+                                       "  a:price: string(16) 9/0/0 null\n"
+                                       "  a:currency: string attribute(272) 3/0/0 null\n"
+                                       "a:tax(0):\n"
+                                       "  a:tax: decimal(20) 0/16/2 null\n"
+                                       "  a:currency: string attribute(272) 3/0/0 null\n";
+
+TEST(IndexedReads, StressSchemaGivesTheRecordsOfTheFirstMatchRule) {
+    TempDir dir;
+    const std::string mainPath = dir.write("main.xsd", kStressMain);
+    dir.write("part.xsd", kStressPart);
+    LogCapture log;
+    ZrXmlSchemaBrowser browser;
+    ZrXmlSchemaBrowserTestAccess access(browser);
+    ASSERT_TRUE(browser.ReadSchema(wide(mainPath).c_str(), false)) << log.lines();
+    EXPECT_EQ(zrtest::dumpRecords(browser.Records()), kStressRecords);
+    EXPECT_EQ(log.lines(), "");
+    // The temporary simple-content entries are gone again.
+    EXPECT_EQ(access.simpleTypes().size(), 3u);
+    expectLookupsAgreeWithScans(access);
+}
+
+// A larger schema over three documents and three target namespaces, in which every
+// kind of name recurs: each document defines the same type, group and simple type
+// names, some twice, some beginning with "anon", next to anonymous types; the
+// declarations refer to them under every prefix.
+std::string stressDocument(int doc, int docs) {
+    const char* spaces[] = {"urn:a", "urn:b", "urn:c"};
+    std::string out =
+        std::string("<?xml version=\"1.0\"?>\n<xs:schema xmlns:xs=\"") + zrtest::kXsdNs +
+        "\" xmlns:a=\"urn:a\" xmlns:b=\"urn:b\" xmlns:c=\"urn:c\" targetNamespace=\"" +
+        spaces[doc] + "\">\n";
+    if (doc + 1 < docs)
+        out += "<xs:include schemaLocation=\"doc" + std::to_string(doc + 1) + ".xsd\"/>\n";
+    const char* prefixes[] = {"a", "b", "c"};
+    for (int i = 0; i < 12; ++i) {
+        const std::string n = std::to_string(i);
+        const std::string mark = std::to_string(doc) + "_" + n;
+        // Simple types: "Code" names repeat in every namespace, "anonCode" names
+        // collide across namespaces under the "anon" rule.
+        for (const char* stem : {"Code", "anonCode"})
+            out += std::string("<xs:simpleType name=\"") + stem + n +
+                   "\"><xs:restriction base=\"xs:string\"><xs:maxLength value=\"" +
+                   std::to_string(1 + doc * 20 + i) + "\"/></xs:restriction></xs:simpleType>\n";
+        // Groups and types of one name; even numbers put the group first.
+        const std::string group = "<xs:group name=\"S" + n +
+                                  "\"><xs:sequence><xs:element name=\"g" + mark +
+                                  "\" type=\"xs:int\"/></xs:sequence></xs:group>\n";
+        const std::string type = "<xs:complexType name=\"S" + n +
+                                 "\"><xs:sequence><xs:element name=\"t" + mark +
+                                 "\" type=\"xs:int\"/></xs:sequence></xs:complexType>\n";
+        out += i % 2 == 0 ? group + type : type + group;
+        // A type defined twice, and one whose author name begins with "anon".
+        for (int copy = 0; copy < (i % 3 == 0 ? 2 : 1); ++copy)
+            out += "<xs:complexType name=\"T" + n + "\"><xs:sequence><xs:element name=\"f" + mark +
+                   "_" + std::to_string(copy) + "\" type=\"" + prefixes[(doc + i) % 3] + ":Code" +
+                   n + "\"/></xs:sequence></xs:complexType>\n";
+        out += "<xs:complexType name=\"anonT" + n + "\"><xs:sequence><xs:element name=\"x" + mark +
+               "\" type=\"c:anonCode" + n + "\"/></xs:sequence></xs:complexType>\n";
+        out += "<xs:element name=\"G" + n + "\" type=\"" + prefixes[i % 3] + ":Code" + n + "\"/>\n";
+    }
+    // Top-level elements referring to every name under every prefix, with anonymous
+    // types in between to use up generated names.
+    for (int i = 0; i < 12; ++i) {
+        const std::string n = std::to_string(i);
+        out += "<xs:element name=\"R" + std::to_string(doc) + "_" + n +
+               "\"><xs:complexType><xs:sequence>\n";
+        for (const char* p : prefixes) {
+            const std::string pn = std::string(p) + "_" + n;
+            out +=
+                std::string("<xs:element name=\"s") + pn + "\" type=\"" + p + ":S" + n + "\"/>\n";
+            out += std::string("<xs:group ref=\"") + p + ":S" + n + "\"/>\n";
+            out +=
+                std::string("<xs:element name=\"t") + pn + "\" type=\"" + p + ":T" + n + "\"/>\n";
+            out += std::string("<xs:element name=\"n") + pn + "\" type=\"" + p + ":anonT" + n +
+                   "\"/>\n";
+            out += std::string("<xs:element name=\"c") + pn + "\" type=\"" + p + ":anonCode" + n +
+                   "\"/>\n";
+            out += std::string("<xs:element ref=\"") + p + ":G" + n + "\"/>\n";
+        }
+        out += "<xs:element name=\"inner" + n +
+               "\"><xs:complexType><xs:attribute name=\"k\" type=\"xs:int\"/></xs:complexType>"
+               "</xs:element>\n";
+        out += "</xs:sequence></xs:complexType></xs:element>\n";
+    }
+    return out + "</xs:schema>\n";
+}
+
+TEST(IndexedReads, ManyRecurringNamesLookUpLikeScans) {
+    TempDir dir;
+    const int docs = 3;
+    for (int doc = 0; doc < docs; ++doc)
+        dir.write("doc" + std::to_string(doc) + ".xsd", stressDocument(doc, docs));
+    LogCapture log;
+    ZrXmlSchemaBrowser browser;
+    ZrXmlSchemaBrowserTestAccess access(browser);
+    ASSERT_TRUE(browser.ReadSchema(wide((dir.path() / "doc0.xsd").string()).c_str(), false))
+        << log.lines();
+    EXPECT_EQ(log.lines(), "");
+    // 3 documents x 12 top-level records, and the records nested in them.
+    EXPECT_GE(browser.Records().Count(), 36);
+    expectLookupsAgreeWithScans(access);
+}
+
+} // namespace

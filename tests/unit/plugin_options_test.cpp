@@ -1,0 +1,113 @@
+// The plug-in's option "QualifiedRecordNames" through the host's option machinery.
+#include "ZrXmlSchemaDict.h"
+#include "zrglob.h"
+
+#include <gtest/gtest.h>
+#include <string>
+
+namespace {
+
+std::string optionText(const ZrDictBrowser& dict, const char16_t* name) {
+    ZrWString value;
+    EXPECT_EQ(dict.GetOption(name, value), BE_OK);
+    return zrUtf16ToUtf8(value.view());
+}
+
+TEST(PluginOptions, OneDefinitionWithItsArguments) {
+    ZrXmlSchemaDict dict(nullptr);
+    EXPECT_EQ(dict.OptionDefCount(), 1);
+    const ZrOptionDef** defs = dict.GetOptionDefs();
+    ASSERT_NE(defs, nullptr);
+    ASSERT_NE(defs[0], nullptr);
+    EXPECT_EQ(defs[1], nullptr);
+    const ZrOptionDef& def = *defs[0];
+    EXPECT_EQ(def.Key().str(), u"qualifiedrecordnames");
+    EXPECT_EQ(def.Name().str(), u"QualifiedRecordNames");
+    EXPECT_EQ(def.Description().str(), u"Strip leading blanks");
+    EXPECT_STREQ(def.DefaultValue().c_str(), "False");
+    EXPECT_EQ(def.Flags(), 0);
+    EXPECT_EQ(def.Values(), nullptr);
+    EXPECT_EQ(def.ValueCount(), 0);
+    EXPECT_NE(def.Getter(), nullptr);
+    EXPECT_NE(def.Setter(), nullptr);
+    EXPECT_EQ(def.WGetter(), nullptr);
+    EXPECT_EQ(def.WSetter(), nullptr);
+    // Every dictionary shares the one definition.
+    ZrXmlSchemaDict other(nullptr);
+    EXPECT_EQ(other.GetOptionDefs()[0], defs[0]);
+}
+
+TEST(PluginOptions, StartsFalseFromTheDefault) {
+    ZrXmlSchemaDict dict(nullptr);
+    EXPECT_FALSE(dict.QualifiedRecords());
+    EXPECT_EQ(optionText(dict, u"QualifiedRecordNames"), "False");
+}
+
+struct SetCase {
+    const char16_t* name;
+    const char16_t* value;
+    bool expected;
+};
+
+const SetCase kSetCases[] = {
+    {u"QualifiedRecordNames", u"True", true},   {u"qualifiedrecordnames", u"true", true},
+    {u"QUALIFIEDRECORDNAMES", u" TRUE ", true}, {u"QualifiedRecordNames", u"False", false},
+    {u"QualifiedRecordNames", u"1", false},     {u"QualifiedRecordNames", u"yes", false},
+    {u"QualifiedRecordNames", u"", false},
+};
+
+TEST(PluginOptions, SetOptionInterpretsTheText) {
+    for (const auto& c : kSetCases) {
+        ZrXmlSchemaDict dict(nullptr);
+        dict.QualifiedRecords(!c.expected);
+        EXPECT_EQ(dict.SetOption(c.name, c.value), BE_OK);
+        EXPECT_EQ(dict.QualifiedRecords(), c.expected) << zrUtf16ToUtf8(c.value);
+        EXPECT_EQ(optionText(dict, c.name), c.expected ? "True" : "False");
+    }
+}
+
+TEST(PluginOptions, SetterReportsChanges) {
+    ZrXmlSchemaDict dict(nullptr);
+    const ZrOptionSetter set = dict.GetOptionDefs()[0]->Setter();
+    void* owner = static_cast<ZrDictBrowser*>(&dict);
+
+    struct Step {
+        const char* value;
+        bool changed;
+        bool after;
+    };
+
+    const Step steps[] = {{"False", false, false},
+                          {"True", true, true},
+                          {"true", false, true},
+                          {"junk", true, false},
+                          {"false", false, false}};
+    for (const auto& step : steps) {
+        bool changed = !step.changed;
+        EXPECT_EQ(set(owner, step.value, changed, nullptr), BE_OK);
+        EXPECT_EQ(changed, step.changed) << step.value;
+        EXPECT_EQ(dict.QualifiedRecords(), step.after) << step.value;
+    }
+}
+
+TEST(PluginOptions, GetterFollowsTheDirectAccessor) {
+    ZrXmlSchemaDict dict(nullptr);
+    dict.QualifiedRecords(true);
+    EXPECT_EQ(optionText(dict, u"qualifiedrecordnames"), ZrGlob::BoolToStr(true));
+    dict.QualifiedRecords(false);
+    EXPECT_EQ(optionText(dict, u"qualifiedrecordnames"), ZrGlob::BoolToStr(false));
+}
+
+TEST(PluginOptions, UnknownNamesAndLoadedOptions) {
+    ZrXmlSchemaDict dict(nullptr);
+    ZrWString value;
+    EXPECT_EQ(dict.SetOption(u"Qualified", u"True"), BE_UNKNOWN_OPTION);
+    EXPECT_EQ(dict.GetOption(u"QualifiedRecordNames ", value), BE_UNKNOWN_OPTION);
+    EXPECT_FALSE(dict.QualifiedRecords());
+
+    ZrString saved("# saved options\nQualifiedRecordNames=True\n");
+    dict.LoadOptions(saved);
+    EXPECT_TRUE(dict.QualifiedRecords());
+}
+
+} // namespace
