@@ -26,6 +26,10 @@
 
 static_assert(std::is_same_v<XMLCh, char16_t>, "the host's wide text must be the parser's XMLCh");
 
+XERCES_CPP_NAMESPACE_BEGIN
+class SAXParser;
+XERCES_CPP_NAMESPACE_END
+
 class ZrXmlSchemaBrowserTestAccess;
 
 // Number of built-in type-definition strings.
@@ -89,6 +93,26 @@ private:
     void doInclude(xercesc::AttributeList& attrs);
     void finishInclude();
 
+    // Start actions of the dispatch that need more than the attributes; they read
+    // the tag's local part from tagLocal.
+    void doElementTag(xercesc::AttributeList& attrs);
+    void doAttributeTag(xercesc::AttributeList& attrs);
+    void doFacetTag(xercesc::AttributeList& attrs);
+    void doSimpleContent(xercesc::AttributeList& attrs);
+    void doComplexContent(xercesc::AttributeList& attrs);
+    void skipSubtree(xercesc::AttributeList& attrs);
+    // Logs and fails a document that nests declarations, types and groups deeper
+    // than the reader keeps state for; the rest of the subtree is skipped.
+    bool tooDeep();
+
+    // Parse driver steps.
+    // Appends a location to documentQueue unless the read has queued it already.
+    bool queueDocument(const ZrWString& location);
+    // Parses documentPath; any failure, thrown or reported, sets `failed`.
+    void parseDocument(xercesc::SAXParser& parser);
+    void logParseStopped(const XMLCh* message);
+    void logOutOfMemory();
+
     // Defines the built-in types and the record type; called by the constructor.
     void defineBuiltinTypes();
 
@@ -98,6 +122,21 @@ private:
     // Record construction.
     ZrRecord* buildRecord(const ElementDef& declaration);
     bool addField(const ElementDef& declaration, ZrRecord* record);
+    bool addDerivedContent(const ComplexTypeDef& type, const ZrWString& recordName,
+                           ZrRecord* record);
+    bool addSimpleContentField(const ComplexTypeDef& type, const ZrWString& recordName,
+                               ZrRecord* record);
+    bool addTextField(const ZrWString& recordName, const ZrWString& typeName,
+                      const ZrWString& typeNs, ZrRecord* record);
+    bool addReference(const ElementDef& reference, ZrRecord* record);
+    bool addGroup(const ElementDef& reference, ZrRecord* record);
+    bool addSimpleField(const ElementDef& declaration, ZrRecord* record);
+    ZrWString qualifiedName(const ZrWString& ns, const ZrWString& local, bool useTargetPrefix);
+    ZrWString recordName(const ZrWString& qualified) const;
+    bool isExpanding(const void* component) const;
+    bool nestingTooDeep(const ZrWString& where);
+    bool takeBuildStep(const ZrWString& where);
+    long buildStepBudget() const;
 
     // Field typing.
     bool lookupType(const XMLCh* localName, const XMLCh* namespaceURI, ZrDType& type);
@@ -107,6 +146,7 @@ private:
     void dtPattern(ZrDType& type, const XMLCh* pattern);
     long branchLength(const XMLCh*& cursor);
     long lengthSpec(const XMLCh*& cursor);
+    long branchLengthAt(const XMLCh*& cursor, int groupDepth);
 
     // Parse driver state.
     bool initialised = true;
@@ -119,6 +159,10 @@ private:
     std::unique_ptr<ZrDType[]> builtinTypes;
     std::unique_ptr<const ZrDType*[]> builtinTypePointers;
     ZrDType recordType;
+    // First built-in type per alias and per usage code: the answers of a scan in
+    // list order, without the scan.
+    std::unordered_map<std::string, const ZrDType*> builtinByAlias;
+    std::unordered_map<short, const ZrDType*> builtinByUsage;
 
     ZrRecordList records;
     bool qualifiedRecords = false;
@@ -151,6 +195,11 @@ private:
 
     std::deque<ZrWString> documentQueue;
     ZrURI documentURI;
+    // Path of the document being parsed, as queued; named in messages.
+    ZrWString documentPath;
+    // Local part and namespace of the tag being dispatched.
+    ZrWString tagLocal;
+    ZrWString tagNamespace;
 
     // For each open "group"/"attributeGroup" element: whether its start opened a
     // definition (true) or was a reference (false).
@@ -160,6 +209,19 @@ private:
     std::unordered_set<ZrWString> queuedDocuments;
     // Records built in the current read, by name.
     std::unordered_map<ZrWString, ZrRecord*> recordsByName;
+
+    // Record-building guards. Groups, element references and base types being drawn
+    // into the record under construction; entries below expansionFloor belong to the
+    // records around it, whose expansions a nested record may legitimately repeat.
+    std::vector<const void*> expansionStack;
+    size_t expansionFloor = 0;
+    // Simple types whose base chain is being resolved.
+    std::unordered_set<const SimpleTypeDef*> resolvingTypes;
+    // Nested buildRecord, group, reference, base-type and simple-type steps open now.
+    int buildDepth = 0;
+    // addField and buildRecord calls of the current read, and their ceiling.
+    long buildSteps = 0;
+    long buildStepLimit = 0;
 };
 
 // Parser input over the host file proxy.
@@ -171,11 +233,16 @@ public:
     ~FPInputSource() override;
 
     xercesc::BinInputStream* makeStream() const override;
+    // True once a stream of this source failed to read its file; the parse then
+    // saw the document end early.
+    bool readFailed() const { return *readError; }
 
 private:
     ZrWString path;
     XMLCh* systemId = nullptr;
     bool designMode = false;
+    // Shared with the streams, which the parser may keep a little longer.
+    std::shared_ptr<bool> readError = std::make_shared<bool>(false);
 };
 
 class FPInputStream : public xercesc::BinInputStream {
@@ -189,6 +256,8 @@ public:
     XMLFilePos curPos() const override;
     XMLSize_t readBytes(XMLByte* buffer, XMLSize_t maxToRead) override;
     const XMLCh* getContentType() const override;
+    // Where a failed read is recorded.
+    void reportReadErrorTo(std::shared_ptr<bool> flag) { readError = std::move(flag); }
 
     // Largest number of bytes one readBytes call hands out; 0 for no limit. Tests
     // lower it to prove the reader does not depend on how the input is chunked.
@@ -197,4 +266,6 @@ public:
 private:
     ZrFileProxy fileProxy;
     uint32_t position = 0;
+    ZrWString path;
+    std::shared_ptr<bool> readError;
 };

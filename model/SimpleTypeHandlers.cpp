@@ -1,0 +1,111 @@
+#include "ZrXmlSchemaBrowser.h"
+#include "zrglob.h"
+
+#include <climits>
+#include <string_view>
+
+// Simple types do not nest: a simple type starting inside another replaces the
+// working record, and the outer one's end stores what the inner one left.
+void ZrXmlSchemaBrowser::doSimpleType(xercesc::AttributeList& attrs) {
+    currentSimpleType.clear();
+    typeTarget = &currentSimpleType;
+
+    for (XMLSize_t i = 0; i < attrs.getLength(); ++i) {
+        ZrXmlUtils::XMLChToWchar(attrs.getName(i), nameBuffer, false);
+        ZrXmlUtils::XMLChToWchar(attrs.getValue(i), valueBuffer, false);
+        if (nameBuffer.startsWith(u"xmlns"))
+            ZrGlob::LogMessage(ZR_SEV_NOTICE, 0, "xmlns in complextype attrs");
+        else if (nameBuffer.view() == u"name")
+            parseName(valueBuffer.c_str(), false, currentSimpleType.name, currentSimpleType.nameNs);
+        else if (nameBuffer.view() == u"base")
+            parseName(valueBuffer.c_str(), true, currentSimpleType.baseName,
+                      currentSimpleType.baseNs);
+    }
+    if (currentSimpleType.name.empty())
+        wsfmt(currentSimpleType.name, u"anon%d", anonCounter++);
+
+    if (currentElement.typeName.empty()) {
+        currentElement.typeName = currentSimpleType.name;
+        currentElement.typeNs = currentSimpleType.nameNs;
+    }
+}
+
+// The working record stays filled: facets met before the next simple type still
+// land in it, and an enclosing simple type stores it once more.
+void ZrXmlSchemaBrowser::finishSimpleType() {
+    simpleTypes.push_back(currentSimpleType);
+    typeTarget = &currentComplexType;
+}
+
+// Before the browser has met any complex or simple type there is nothing to
+// restrict: the base is dropped.
+void ZrXmlSchemaBrowser::doRestriction(xercesc::AttributeList& attrs) {
+    for (XMLSize_t i = 0; i < attrs.getLength(); ++i) {
+        ZrXmlUtils::XMLChToWchar(attrs.getName(i), nameBuffer, false);
+        if (nameBuffer.view() != u"base" || !typeTarget)
+            continue;
+        ZrXmlUtils::XMLChToWchar(attrs.getValue(i), valueBuffer, false);
+        parseName(valueBuffer.c_str(), true, typeTarget->baseName, typeTarget->baseNs);
+    }
+}
+
+void ZrXmlSchemaBrowser::finishRestriction() {}
+
+// A list types its values as text; its item type, named or inline, plays no part,
+// so its content is skipped together with its end tag.
+void ZrXmlSchemaBrowser::doList(xercesc::AttributeList&) {
+    if (typeTarget)
+        parseName(u"string", true, typeTarget->baseName, typeTarget->baseNs);
+    ++skipDepth;
+}
+
+void ZrXmlSchemaBrowser::doFacet(xercesc::AttributeList& attrs, SimpleTypeDef& type,
+                                 const XMLCh* facetName) {
+    struct TextFacet {
+        std::u16string_view name;
+        ZrWString SimpleTypeDef::*field;
+    };
+
+    static constexpr TextFacet kTextFacets[] = {
+        {u"minInclusive", &SimpleTypeDef::minInclusive},
+        {u"maxInclusive", &SimpleTypeDef::maxInclusive},
+        {u"minExclusive", &SimpleTypeDef::minExclusive},
+        {u"maxExclusive", &SimpleTypeDef::maxExclusive},
+        {u"length", &SimpleTypeDef::length},
+        {u"minLength", &SimpleTypeDef::minLength},
+        {u"maxLength", &SimpleTypeDef::maxLength},
+        {u"pattern", &SimpleTypeDef::pattern},
+        {u"precision", &SimpleTypeDef::precision},
+        {u"scale", &SimpleTypeDef::scale},
+        {u"encoding", &SimpleTypeDef::encoding},
+        {u"period", &SimpleTypeDef::period},
+        {u"duration", &SimpleTypeDef::duration},
+    };
+
+    ZrWString value;
+    bool hasValue = false;
+    for (XMLSize_t i = 0; i < attrs.getLength(); ++i) {
+        ZrXmlUtils::XMLChToWchar(attrs.getName(i), type.facetAttrName, false);
+        ZrXmlUtils::XMLChToWchar(attrs.getValue(i), type.facetAttrValue, false);
+        if (type.facetAttrName.view() == u"value") {
+            value = type.facetAttrValue;
+            hasValue = true;
+        }
+    }
+
+    const std::u16string_view facet = facetName ? facetName : u"";
+    for (const TextFacet& entry : kTextFacets) {
+        if (entry.name == facet) {
+            // A facet without a value empties the field: only the last occurrence
+            // counts.
+            type.*entry.field = std::move(value);
+            return;
+        }
+    }
+    if (facet == u"enumeration" && hasValue) {
+        const long length = value.length();
+        const int32_t clamped = length > INT32_MAX ? INT32_MAX : static_cast<int32_t>(length);
+        if (clamped > type.maxEnumLength)
+            type.maxEnumLength = clamped;
+    }
+}

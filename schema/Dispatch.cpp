@@ -1,0 +1,146 @@
+#include "ZrXmlSchemaBrowser.h"
+#include "zrglob.h"
+
+#include <string_view>
+
+namespace {
+
+// Open declarations, complex types and group definitions the reader keeps state
+// for at once. Real schemas nest a few dozen deep; the bound keeps a hostile
+// document from growing the saved state without limit.
+constexpr size_t kMaxOpenComponents = 10000;
+
+} // namespace
+
+void ZrXmlSchemaBrowser::startElement(const XMLCh* name, xercesc::AttributeList& attrs) {
+    using Action = void (ZrXmlSchemaBrowser::*)(xercesc::AttributeList&);
+
+    struct StartAction {
+        std::u16string_view name;
+        Action act;
+    };
+
+    // First match acts; names not listed (compositors, wildcards, unions, imports)
+    // do nothing and their content is dispatched as usual.
+    static constexpr StartAction kStartTable[] = {
+        {u"schema", nullptr}, // its attributes and namespace are taken above
+        {u"annotation", &ZrXmlSchemaBrowser::skipSubtree},
+        {u"notation", &ZrXmlSchemaBrowser::skipSubtree},
+        {u"documentation", &ZrXmlSchemaBrowser::skipSubtree},
+        {u"element", &ZrXmlSchemaBrowser::doElementTag},
+        {u"attribute", &ZrXmlSchemaBrowser::doAttributeTag},
+        {u"complexType", &ZrXmlSchemaBrowser::doComplexType},
+        {u"group", &ZrXmlSchemaBrowser::doGroup},
+        {u"attributeGroup", &ZrXmlSchemaBrowser::doGroup},
+        {u"simpleType", &ZrXmlSchemaBrowser::doSimpleType},
+        {u"restriction", &ZrXmlSchemaBrowser::doRestriction},
+        {u"list", &ZrXmlSchemaBrowser::doList},
+        {u"include", &ZrXmlSchemaBrowser::doInclude},
+        {u"extension", &ZrXmlSchemaBrowser::doExtension},
+        {u"simpleContent", &ZrXmlSchemaBrowser::doSimpleContent},
+        {u"complexContent", &ZrXmlSchemaBrowser::doComplexContent},
+        {u"minInclusive", &ZrXmlSchemaBrowser::doFacetTag},
+        {u"maxInclusive", &ZrXmlSchemaBrowser::doFacetTag},
+        {u"minExclusive", &ZrXmlSchemaBrowser::doFacetTag},
+        {u"maxExclusive", &ZrXmlSchemaBrowser::doFacetTag},
+        {u"length", &ZrXmlSchemaBrowser::doFacetTag},
+        {u"minLength", &ZrXmlSchemaBrowser::doFacetTag},
+        {u"maxLength", &ZrXmlSchemaBrowser::doFacetTag},
+        {u"pattern", &ZrXmlSchemaBrowser::doFacetTag},
+        {u"precision", &ZrXmlSchemaBrowser::doFacetTag},
+        {u"scale", &ZrXmlSchemaBrowser::doFacetTag},
+        {u"encoding", &ZrXmlSchemaBrowser::doFacetTag},
+        {u"period", &ZrXmlSchemaBrowser::doFacetTag},
+        {u"duration", &ZrXmlSchemaBrowser::doFacetTag},
+        {u"enumeration", &ZrXmlSchemaBrowser::doFacetTag},
+    };
+
+    if (skipDepth != 0) {
+        ++skipDepth;
+        return;
+    }
+    if (firstElement) {
+        FirstElementAttrs(attrs);
+        firstElement = false;
+    }
+    ZrXmlUtils::XMLChToWchar(name, nameBuffer, false);
+    parseName(nameBuffer.c_str(), true, tagLocal, tagNamespace);
+    if (tagLocal.view() == u"schema")
+        schemaNamespace = tagNamespace;
+    if (tagNamespace != schemaNamespace)
+        ZrGlob::LogMessage(ZR_SEV_NOTICE, 0,
+                           "Element '%S' not in XMLSchema namespace (is '%S', should be '%S'",
+                           tagLocal.c_str(), tagNamespace.c_str(), schemaNamespace.c_str());
+
+    for (const StartAction& entry : kStartTable) {
+        if (entry.name == tagLocal.view()) {
+            if (entry.act)
+                (this->*entry.act)(attrs);
+            return;
+        }
+    }
+}
+
+void ZrXmlSchemaBrowser::endElement(const XMLCh* name) {
+    struct EndAction {
+        std::u16string_view name;
+        void (ZrXmlSchemaBrowser::*act)();
+    };
+
+    static constexpr EndAction kEndTable[] = {
+        {u"element", &ZrXmlSchemaBrowser::finishElement},
+        {u"attribute", &ZrXmlSchemaBrowser::finishElement},
+        {u"complexType", &ZrXmlSchemaBrowser::finishComplexType},
+        {u"simpleType", &ZrXmlSchemaBrowser::finishSimpleType},
+        {u"restriction", &ZrXmlSchemaBrowser::finishRestriction},
+        {u"include", &ZrXmlSchemaBrowser::finishInclude},
+        {u"group", &ZrXmlSchemaBrowser::finishGroup},
+        {u"attributeGroup", &ZrXmlSchemaBrowser::finishGroup},
+    };
+
+    // The end tags of a skipped subtree, the skipping element's and a list's own
+    // included, only unwind the count.
+    if (skipDepth != 0) {
+        --skipDepth;
+        return;
+    }
+    ZrXmlUtils::XMLChToWchar(name, nameBuffer, false);
+    parseName(nameBuffer.c_str(), true, tagLocal, tagNamespace);
+    for (const EndAction& entry : kEndTable) {
+        if (entry.name == tagLocal.view()) {
+            (this->*entry.act)();
+            return;
+        }
+    }
+}
+
+void ZrXmlSchemaBrowser::skipSubtree(xercesc::AttributeList&) { skipDepth = 1; }
+
+void ZrXmlSchemaBrowser::doElementTag(xercesc::AttributeList& attrs) { doElement(attrs, false); }
+
+void ZrXmlSchemaBrowser::doAttributeTag(xercesc::AttributeList& attrs) { doElement(attrs, true); }
+
+void ZrXmlSchemaBrowser::doFacetTag(xercesc::AttributeList& attrs) {
+    doFacet(attrs, currentSimpleType, tagLocal.c_str());
+}
+
+void ZrXmlSchemaBrowser::doSimpleContent(xercesc::AttributeList&) {
+    currentComplexType.simpleContent = true;
+}
+
+void ZrXmlSchemaBrowser::doComplexContent(xercesc::AttributeList&) {
+    currentComplexType.simpleContent = false;
+}
+
+bool ZrXmlSchemaBrowser::tooDeep() {
+    if (elementStack.size() + complexTypeStack.size() < kMaxOpenComponents)
+        return false;
+    if (!failed)
+        ZrGlob::LogMessage(
+            ZR_SEV_ERROR, 4,
+            lgettext(u"Schema: Error: Declarations and types nested deeper than %d in file %s"),
+            static_cast<int>(kMaxOpenComponents), documentPath.c_str());
+    failed = true;
+    skipDepth = 1;
+    return true;
+}

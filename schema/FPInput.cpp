@@ -1,0 +1,66 @@
+#include "ZrXmlSchemaBrowser.h"
+#include "zrglob.h"
+
+#include <algorithm>
+#include <climits>
+#include <xercesc/util/PlatformUtils.hpp>
+
+XMLSize_t FPInputStream::chunkLimit = 0;
+
+FPInputSource::FPInputSource(const ZrWChar* documentPath)
+    : xercesc::InputSource(xercesc::XMLPlatformUtils::fgMemoryManager), path(documentPath) {
+    const size_t length = static_cast<size_t>(path.length());
+    systemId = new XMLCh[length + 1];
+    std::copy(path.c_str(), path.c_str() + length + 1, systemId);
+    setSystemId(systemId);
+}
+
+FPInputSource::~FPInputSource() { delete[] systemId; }
+
+// A null stream makes the parser report that the document cannot be opened, which
+// fails the read through its error callbacks.
+xercesc::BinInputStream* FPInputSource::makeStream() const {
+    auto* stream = new FPInputStream(path.c_str(), designMode);
+    if (!stream->isOpen()) {
+        delete stream;
+        return nullptr;
+    }
+    stream->reportReadErrorTo(readError);
+    return stream;
+}
+
+FPInputStream::FPInputStream(const ZrWChar* documentPath, bool designMode) : path(documentPath) {
+    ZrString narrowPath;
+    narrowPath.Assign(documentPath, ZR_CSET_DEFAULT, -1);
+    if (fileProxy.openfile(narrowPath.c_str(), "rb", ZR_CSET_FILESYSTEM) != -1)
+        fileProxy.setDesignMode(designMode);
+}
+
+FPInputStream::~FPInputStream() { fileProxy.close(false); }
+
+XMLFilePos FPInputStream::curPos() const { return position; }
+
+XMLSize_t FPInputStream::readBytes(XMLByte* buffer, XMLSize_t maxToRead) {
+    XMLSize_t wanted = maxToRead;
+    if (chunkLimit != 0 && wanted > chunkLimit)
+        wanted = chunkLimit;
+    if (wanted > static_cast<XMLSize_t>(LONG_MAX))
+        wanted = static_cast<XMLSize_t>(LONG_MAX);
+    const long count = fileProxy.read(reinterpret_cast<char*>(buffer), static_cast<long>(wanted));
+    if (count < 0) {
+        // The parser takes the count as a size; a negative one must never reach
+        // it. The document ends here instead (an exception would leak parser
+        // state when it leaves the parser's reader set-up), and the recorded
+        // error fails the read.
+        if (!readError || !*readError)
+            ZrGlob::LogMessage(ZR_SEV_ERROR, 4, lgettext(u"Schema: Error: Reading file %s failed"),
+                               path.c_str());
+        if (readError)
+            *readError = true;
+        return 0;
+    }
+    position += static_cast<uint32_t>(count);
+    return static_cast<XMLSize_t>(count);
+}
+
+const XMLCh* FPInputStream::getContentType() const { return nullptr; }

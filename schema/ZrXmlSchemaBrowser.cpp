@@ -1,0 +1,253 @@
+#include "ZrXmlSchemaBrowser.h"
+
+#include "ParserConfig.h"
+#include "zrglob.h"
+
+#include <new>
+#include <string_view>
+#include <xercesc/framework/MemBufInputSource.hpp>
+#include <xercesc/sax/SAXException.hpp>
+#include <xercesc/util/OutOfMemoryException.hpp>
+#include <xercesc/util/PlatformUtils.hpp>
+#include <xercesc/util/XMLException.hpp>
+#include <xercesc/util/XMLUni.hpp>
+
+using xercesc::SAXParseException;
+using xercesc::XMLPlatformUtils;
+
+ZrXmlSchemaBrowser::ZrXmlSchemaBrowser() {
+    try {
+        XMLPlatformUtils::Initialize(xercesc::XMLUni::fgXercescDefaultLocale, nullptr, nullptr,
+                                     nullptr);
+    } catch (const xercesc::XMLException& e) {
+        initialised = false;
+        ZrXmlUtils::XMLChToWchar(e.getMessage(), initError, false);
+    }
+    defineBuiltinTypes();
+}
+
+// The parser library stays initialised: other browsers and the host may use it.
+ZrXmlSchemaBrowser::~ZrXmlSchemaBrowser() = default;
+
+namespace {
+
+// Lexical form of a document location used to recognise a document queued twice:
+// both separators count alike, "." segments and empty segments go, and "dir/.."
+// cancels out. A leading separator (two for a network path) or drive is kept.
+std::u16string normaliseLocation(std::u16string_view location) {
+    auto isSep = [](char16_t c) { return c == u'/' || c == u'\\'; };
+    std::u16string root;
+    size_t pos = 0;
+    if (location.size() >= 2 && location[1] == u':' && !isSep(location[0])) {
+        root.assign(location.substr(0, 2));
+        pos = 2;
+    }
+    size_t leading = 0;
+    while (pos + leading < location.size() && isSep(location[pos + leading]))
+        ++leading;
+    if (leading > 0)
+        root.append(leading == 2 && pos == 0 ? u"//" : u"/");
+    pos += leading;
+    const bool rooted = leading > 0;
+
+    std::vector<std::u16string_view> segments;
+    while (pos < location.size()) {
+        size_t end = pos;
+        while (end < location.size() && !isSep(location[end]))
+            ++end;
+        std::u16string_view segment = location.substr(pos, end - pos);
+        if (segment.empty() || segment == u".") {
+            // nothing: a duplicate separator or a "this directory" step
+        } else if (segment == u"..") {
+            if (!segments.empty() && segments.back() != u"..")
+                segments.pop_back();
+            else if (!rooted)
+                segments.push_back(segment);
+        } else {
+            segments.push_back(segment);
+        }
+        pos = end + 1;
+    }
+    std::u16string out = root;
+    for (size_t i = 0; i < segments.size(); ++i) {
+        if (i > 0)
+            out += u'/';
+        out.append(segments[i]);
+    }
+    return out;
+}
+
+} // namespace
+
+bool ZrXmlSchemaBrowser::queueDocument(const ZrWString& location) {
+    if (!queuedDocuments.insert(ZrWString(normaliseLocation(location.view()))).second)
+        return false;
+    documentQueue.push_back(location);
+    return true;
+}
+
+bool ZrXmlSchemaBrowser::ReadSchema(const ZrWChar* path, bool qualified) {
+    if (!initialised) {
+        ZrGlob::LogMessage(ZR_SEV_ERROR, BE_READ_FAILED,
+                           lgettext(u"SchemaBrowser: Initialization error: %s"), initError.c_str());
+        return false;
+    }
+    qualifiedRecords = qualified;
+
+    try {
+        auto parser = std::make_unique<SchemaParser>();
+        parser->setDocumentHandler(this);
+        parser->setErrorHandler(this);
+        parser->setEntityResolver(this);
+
+        defaultNamespace.clear();
+        targetNamespace.clear();
+        namespacePrefixes.clear();
+
+        elementStack.clear();
+        currentElement.clear();
+        // A read that failed inside a non-nullable declaration must not hand that
+        // flag to the first declaration of this one.
+        currentElement.nullable = true;
+        complexTypeStack.clear();
+        currentComplexType.clear();
+        complexDepth = 0;
+        currentSimpleType.clear();
+        simpleTypes.clear();
+        complexTypes.clear();
+        globalElements.clear();
+        anonCounter = 0;
+        groupOpenedDefinition.clear();
+
+        records.Clear();
+        recordsByName.clear();
+        recordWorkList.clear();
+        documentQueue.clear();
+        queuedDocuments.clear();
+
+        documentPath = path;
+        queueDocument(documentPath);
+
+        while (!documentQueue.empty()) {
+            firstElement = true;
+            failed = false;
+            skipDepth = 0;
+            documentPath = std::move(documentQueue.front());
+            documentQueue.pop_front();
+            documentURI = documentPath.c_str();
+            parseDocument(*parser);
+            if (failed)
+                return false;
+        }
+
+        for (size_t i = 0; i < globalElements.size(); ++i) {
+            const ElementDef& declaration = globalElements[i];
+            ComplexTypeDef* type =
+                findComplexType(declaration.typeName.c_str(), declaration.typeNs.c_str());
+            recordWorkList.clear();
+            if (type && !buildRecord(declaration))
+                return false;
+        }
+        return true;
+    } catch (const xercesc::OutOfMemoryException&) {
+        logOutOfMemory();
+    } catch (const std::bad_alloc&) {
+        logOutOfMemory();
+    }
+    return false;
+}
+
+// Formatting the message may itself run out of memory; nothing may leave the read.
+void ZrXmlSchemaBrowser::logOutOfMemory() {
+    try {
+        ZrGlob::LogMessage(ZR_SEV_ERROR, BE_NO_MEMORY,
+                           lgettext(u"Schema: Out of memory reading file %s"),
+                           documentPath.c_str());
+    } catch (...) {
+    }
+}
+
+void ZrXmlSchemaBrowser::parseDocument(xercesc::SAXParser& parser) {
+    try {
+        FPInputSource source(documentPath.c_str());
+        parser.parse(source);
+        if (source.readFailed())
+            failed = true;
+    } catch (const xercesc::OutOfMemoryException&) {
+        logOutOfMemory();
+        failed = true;
+    } catch (const std::bad_alloc&) {
+        logOutOfMemory();
+        failed = true;
+    } catch (const SchemaEntityTooLong& e) {
+        ZrGlob::LogMessage(
+            ZR_SEV_ERROR, 4,
+            lgettext(u"Schema: Error: Entity '%s' in file %s is longer than %d characters"),
+            e.name.c_str(), documentPath.c_str(), static_cast<int>(kSchemaEntityValueLimit));
+        failed = true;
+    } catch (const xercesc::XMLException& e) {
+        logParseStopped(e.getMessage());
+    } catch (const xercesc::SAXException& e) {
+        logParseStopped(e.getMessage());
+    } catch (const std::exception& e) {
+        ZrWString message;
+        message.Assign(e.what(), ZR_CSET_DEFAULT, -1);
+        logParseStopped(message.c_str());
+    } catch (...) {
+        logParseStopped(u"unknown error");
+    }
+}
+
+void ZrXmlSchemaBrowser::logParseStopped(const XMLCh* message) {
+    ZrGlob::LogMessage(ZR_SEV_ERROR, 4, lgettext(u"Schema: Error: Reading file %s stopped: %s"),
+                       documentPath.c_str(), message ? message : u"");
+    failed = true;
+}
+
+namespace {
+
+// Logs one parser diagnostic: the parser's message, from just after its
+// "Message:" label when it has one, with the position and the document.
+void logParserDiagnostic(int severity, const XMLCh* format, const SAXParseException& e) {
+    const XMLCh* text = e.getMessage();
+    ZrXString message(text ? text : u"", -1, ZR_CSET_DEFAULT);
+    const long at = message.find(ZrXString("Message:", ZR_CSET_DEFAULT), 0);
+    if (at != ZrXString::npos)
+        message = message.substr(at + 8);
+    const XMLCh* systemId = e.getSystemId();
+    ZrXString file(systemId ? systemId : u"", -1, ZR_CSET_DEFAULT);
+    ZrGlob::LogMessage(severity, 4, lgettext(format), static_cast<int>(e.getLineNumber()),
+                       static_cast<int>(e.getColumnNumber()), file.w_str(), message.w_str());
+}
+
+} // namespace
+
+void ZrXmlSchemaBrowser::warning(const SAXParseException& e) {
+    logParserDiagnostic(ZR_SEV_WARNING, u"Schema: Warning: At line %d, column %d of file %s: %s",
+                        e);
+}
+
+void ZrXmlSchemaBrowser::error(const SAXParseException& e) {
+    logParserDiagnostic(ZR_SEV_ERROR, u"Schema: Error: At line %d, column %d of file %s: %s", e);
+    failed = true;
+}
+
+void ZrXmlSchemaBrowser::fatalError(const SAXParseException& e) {
+    logParserDiagnostic(ZR_SEV_FATAL, u"Schema: Fatal: At line %d, column %d of file %s: %s", e);
+    failed = true;
+}
+
+// Schema documents are read from the locations the reader resolves itself, never
+// through entities: an external entity or DTD could make the parser open any
+// local file or reach the network. The request fails the read and is answered
+// with an empty document, so nothing is opened.
+xercesc::InputSource* ZrXmlSchemaBrowser::resolveEntity(const XMLCh* publicId,
+                                                        const XMLCh* systemId) {
+    const XMLCh* name = systemId && *systemId ? systemId : publicId;
+    ZrGlob::LogMessage(ZR_SEV_ERROR, 4,
+                       lgettext(u"Schema: Error: External entity '%s' in file %s is not read"),
+                       name ? name : u"", documentPath.c_str());
+    failed = true;
+    static const XMLByte kNothing[] = {0};
+    return new xercesc::MemBufInputSource(kNothing, 0, systemId ? systemId : u"", false);
+}

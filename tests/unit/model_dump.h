@@ -1,0 +1,133 @@
+// Reading helpers of the schema and model tests: read a schema into a fresh
+// browser and print its component model as stable text.
+#pragma once
+
+#include "TestSupport.h"
+
+#include <string>
+#include <utility>
+
+namespace zrtest {
+
+// "{ns}local", or "local" without a namespace; the XML Schema namespace prints
+// as "xs".
+inline std::string qname(const ZrWString& local, const ZrWString& ns) {
+    if (ns.empty())
+        return utf8(local);
+    std::string uri = utf8(ns);
+    if (uri == kXsdNs)
+        uri = "xs";
+    return "{" + uri + "}" + utf8(local);
+}
+
+inline std::string dumpElement(const ElementDef& e) {
+    std::string out = e.isAttribute ? "attribute" : "element";
+    auto part = [&out](const char* key, const ZrWString& local, const ZrWString& ns) {
+        if (!local.empty() || !ns.empty())
+            out += std::string(" ") + key + "=" + qname(local, ns);
+    };
+    part("name", e.name, e.nameNs);
+    part("type", e.typeName, e.typeNs);
+    part("ref", e.refName, e.refNs);
+    part("group", e.groupName, e.groupNs);
+    if (!e.nullable)
+        out += " !nullable";
+    return out;
+}
+
+inline std::string dumpTypeParts(const SimpleTypeDef& t) {
+    std::string out = qname(t.name, t.nameNs);
+    if (!t.baseName.empty() || !t.baseNs.empty())
+        out += " base=" + qname(t.baseName, t.baseNs);
+    const std::pair<const char*, const ZrWString*> facets[] = {{"minInclusive", &t.minInclusive},
+                                                               {"maxInclusive", &t.maxInclusive},
+                                                               {"minExclusive", &t.minExclusive},
+                                                               {"maxExclusive", &t.maxExclusive},
+                                                               {"length", &t.length},
+                                                               {"minLength", &t.minLength},
+                                                               {"maxLength", &t.maxLength},
+                                                               {"pattern", &t.pattern},
+                                                               {"precision", &t.precision},
+                                                               {"scale", &t.scale},
+                                                               {"encoding", &t.encoding},
+                                                               {"period", &t.period},
+                                                               {"duration", &t.duration}};
+    for (const auto& [key, value] : facets) {
+        if (!value->empty())
+            out += std::string(" ") + key + "=" + utf8(*value);
+    }
+    if (t.maxEnumLength != 0)
+        out += " enum=" + std::to_string(t.maxEnumLength);
+    return out;
+}
+
+// Top-level declarations, then complex types with their content, then simple
+// types, each in stored order.
+inline std::string dumpModel(ZrXmlSchemaBrowserTestAccess& a) {
+    std::string out;
+    for (const ElementDef& e : a.globalElements())
+        out += "global " + dumpElement(e) + "\n";
+    for (const ComplexTypeDef& t : a.complexTypes()) {
+        out += "complexType " + dumpTypeParts(t);
+        if (t.isGroup)
+            out += " group";
+        if (t.simpleContent)
+            out += " simpleContent";
+        out += "\n";
+        for (const ElementDef& e : t.content)
+            out += "  " + dumpElement(e) + "\n";
+    }
+    for (const SimpleTypeDef& t : a.simpleTypes())
+        out += "simpleType " + dumpTypeParts(t) + "\n";
+    return out;
+}
+
+// Replaces every occurrence of `from` in `text`.
+inline std::string replaceAll(std::string text, const std::string& from, const std::string& to) {
+    for (size_t at = text.find(from); !from.empty() && at != std::string::npos;
+         at = text.find(from, at + to.size()))
+        text.replace(at, from.size(), to);
+    return text;
+}
+
+// Runs a read with the input handed out at most `chunk` bytes at a time (0: as
+// much as the parser asks for).
+class ChunkLimit {
+  public:
+    explicit ChunkLimit(XMLSize_t chunk) : saved_(FPInputStream::chunkLimit) {
+        FPInputStream::chunkLimit = chunk;
+    }
+
+    ChunkLimit(const ChunkLimit&) = delete;
+    ChunkLimit& operator=(const ChunkLimit&) = delete;
+
+    ~ChunkLimit() { FPInputStream::chunkLimit = saved_; }
+
+  private:
+    XMLSize_t saved_;
+};
+
+struct ReadOutcome {
+    bool ok;
+    std::string model; // dumpModel of the browser after the read
+    std::string log;   // LogCapture lines, the temporary folder shown as "$DIR"
+};
+
+// Reads `mainPath` with a fresh browser.
+inline ReadOutcome readSchemaFile(const std::string& mainPath, const std::string& dir,
+                                  XMLSize_t chunk = 0) {
+    ChunkLimit limit(chunk);
+    LogCapture log;
+    ZrXmlSchemaBrowser browser;
+    ZrXmlSchemaBrowserTestAccess access(browser);
+    const bool ok = browser.ReadSchema(wide(mainPath).c_str(), false);
+    return {ok, dumpModel(access), replaceAll(log.lines(), dir, "$DIR")};
+}
+
+// Reads one schema document given as text.
+inline ReadOutcome readSchemaText(const std::string& document, XMLSize_t chunk = 0) {
+    TempDir dir;
+    return readSchemaFile(dir.write("main.xsd", document), dir.path().string(), chunk);
+}
+
+} // namespace zrtest

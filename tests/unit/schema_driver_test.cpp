@@ -1,0 +1,298 @@
+// The parse driver: failed reads, parser diagnostics, input that must not be
+// trusted (entities, DTDs, unreadable files, deep nesting).
+#include "ParserConfig.h"
+#include "model_dump.h"
+
+#include <gtest/gtest.h>
+#include <sstream>
+#include <xercesc/sax/SAXParseException.hpp>
+
+namespace {
+
+using namespace zrtest;
+
+// True when `text` matches `pattern`, in which '*' stands for any run of
+// characters; the parser's own texts are matched that way.
+bool globMatch(const std::string& pattern, const std::string& text) {
+    size_t p = 0, t = 0, star = std::string::npos, mark = 0;
+    while (t < text.size()) {
+        if (p < pattern.size() && pattern[p] == '*') {
+            star = p++;
+            mark = t;
+        } else if (p < pattern.size() && pattern[p] == text[t]) {
+            ++p;
+            ++t;
+        } else if (star != std::string::npos) {
+            p = star + 1;
+            t = ++mark;
+        } else {
+            return false;
+        }
+    }
+    while (p < pattern.size() && pattern[p] == '*')
+        ++p;
+    return p == pattern.size();
+}
+
+// Each line of `log` against the pattern on the same line of `patterns`.
+void expectLog(const std::string& log, const std::string& patterns) {
+    std::istringstream actual(log), expected(patterns);
+    std::string a, e;
+    while (true) {
+        const bool moreActual = static_cast<bool>(std::getline(actual, a));
+        const bool moreExpected = static_cast<bool>(std::getline(expected, e));
+        if (!moreActual && !moreExpected)
+            return;
+        ASSERT_EQ(moreActual, moreExpected) << "log:\n" << log << "expected:\n" << patterns;
+        EXPECT_TRUE(globMatch(e, a)) << "line:     " << a << "\npattern:  " << e;
+    }
+}
+
+struct DriverCase {
+    const char* name;
+    // Files of the case: name, then content; "main.xsd" is read.
+    std::vector<std::pair<std::string, std::string>> files;
+    bool ok;
+    const char* model;
+    const char* log;
+};
+
+const std::string kBillionLaughs = R"(<?xml version="1.0"?>
+<!DOCTYPE xs:schema [
+ <!ENTITY a "aaaaaaaaaa">
+ <!ENTITY b "&a;&a;&a;&a;&a;&a;&a;&a;&a;&a;">
+ <!ENTITY c "&b;&b;&b;&b;&b;&b;&b;&b;&b;&b;">
+ <!ENTITY d "&c;&c;&c;&c;&c;&c;&c;&c;&c;&c;">
+ <!ENTITY e "&d;&d;&d;&d;&d;&d;&d;&d;&d;&d;">
+ <!ENTITY f "&e;&e;&e;&e;&e;&e;&e;&e;&e;&e;">
+ <!ENTITY g "&f;&f;&f;&f;&f;&f;&f;&f;&f;&f;">
+ <!ENTITY h "&g;&g;&g;&g;&g;&g;&g;&g;&g;&g;">
+ <!ENTITY i "&h;&h;&h;&h;&h;&h;&h;&h;&h;&h;">
+ <!ENTITY j "&i;&i;&i;&i;&i;&i;&i;&i;&i;&i;">
+]>
+<xs:schema xmlns:xs="http://www.w3.org/2001/XMLSchema">
+)";
+
+std::string withDoctype(const std::string& doctype, const std::string& body) {
+    return "<?xml version=\"1.0\"?>\n" + doctype + "\n<xs:schema xmlns:xs=\"" + kXsdNs + "\">\n" +
+           body + "\n</xs:schema>\n";
+}
+
+const std::string kInjected = R"(<xs:element name="injected" type="xs:string"/>)";
+
+const DriverCase kDriverCases[] = {
+    {"EmptySchema", {{"main.xsd", schemaDoc("")}}, true, "", ""},
+    {"WarningsAloneDoNotFailTheRead",
+     {{"main.xsd", withDoctype(R"(<!DOCTYPE xs:schema [<!ATTLIST xs:schema a CDATA #IMPLIED>
+                                   <!ATTLIST xs:schema a CDATA #IMPLIED>]>)",
+                               kInjected)}},
+     true,
+     "global element name=injected type={xs}string\n",
+     "2 4 Schema: Warning: At line 3, column * of file $DIR/main.xsd: attribute 'a' *\n"},
+    {"MalformedDocument",
+     {{"main.xsd", std::string("<?xml version=\"1.0\"?>\n<xs:schema xmlns:xs=\"") + kXsdNs +
+                       "\">\n<xs:annotation></xs:annot>\n</xs:schema>\n"}},
+     false,
+     "",
+     "8 4 Schema: Fatal: At line 3, column * of file $DIR/main.xsd: *\n"},
+    {"ErrorInIncludedDocumentStopsTheRead",
+     {{"main.xsd", schemaDoc(R"(<xs:include schemaLocation="bad.xsd"/>
+                                <xs:include schemaLocation="good.xsd"/>
+                                <xs:element name="main" type="xs:string"/>)")},
+      {"bad.xsd", schemaDoc("<xs:element name=\"bad\" type=\"xs:string\">")},
+      {"good.xsd", schemaDoc("", "unknown=\"1\"")}},
+     false,
+     "global element name=main type={xs}string\n",
+     "8 4 Schema: Fatal: At line 4, column 3 of file $DIR/bad.xsd: expected end of tag *\n"},
+    {"MissingInclude",
+     {{"main.xsd", schemaDoc(R"(<xs:include schemaLocation="missing.xsd"/>)")}},
+     false,
+     "",
+     "8 4 Schema: Fatal: At line 0, column 0 of file : *'$DIR/missing.xsd'\n"},
+    {"BillionLaughsInContent",
+     {{"main.xsd", kBillionLaughs + "<xs:annotation>&j;</xs:annotation></xs:schema>\n"}},
+     false,
+     "",
+     "8 4 Schema: Fatal: At line *, column * of file $DIR/main.xsd: *entity expansion*\n"},
+    {"BillionLaughsInAttribute",
+     {{"main.xsd", kBillionLaughs + "<xs:element name=\"&j;\"/></xs:schema>\n"}},
+     false,
+     "",
+     "8 4 Schema: Fatal: At line *, column * of file $DIR/main.xsd: *entity expansion*\n"},
+    {"LongEntityDeclaration",
+     {{"main.xsd", withDoctype("<!DOCTYPE xs:schema [<!ENTITY big \"" +
+                                   std::string(kSchemaEntityValueLimit + 1, 'x') + "\">]>",
+                               "<xs:element name=\"&big;\"/>")}},
+     false,
+     "",
+     "4 4 Schema: Error: Entity 'big' in file $DIR/main.xsd is longer than 4096 characters\n"},
+    {"ExternalEntityFromDisk",
+     {{"main.xsd",
+       withDoctype(R"(<!DOCTYPE xs:schema [<!ENTITY ext SYSTEM "ext.xml">]>)", "&ext;")},
+      {"ext.xml", kInjected}},
+     false,
+     "",
+     "4 4 Schema: Error: External entity 'ext.xml' in file $DIR/main.xsd is not read\n"},
+    {"ExternalEntityFromNetwork",
+     {{"main.xsd", withDoctype(R"(<!DOCTYPE xs:schema [
+            <!ENTITY ext PUBLIC "-//x//y" "http://127.0.0.1:9/ext.xml">]>)",
+                               "&ext;")}},
+     false,
+     "",
+     "4 4 Schema: Error: External entity 'http://127.0.0.1:9/ext.xml' in file $DIR/main.xsd "
+     "is not read\n"},
+    {"ExternalDtdFromDiskIsIgnored",
+     {{"main.xsd", withDoctype(R"(<!DOCTYPE xs:schema SYSTEM "bad.dtd">)", kInjected)},
+      {"bad.dtd", "this is no DTD <!ELEMENT"}},
+     true,
+     "global element name=injected type={xs}string\n",
+     ""},
+    {"ExternalDtdFromNetworkIsIgnored",
+     {{"main.xsd",
+       withDoctype(R"(<!DOCTYPE xs:schema PUBLIC "-//x//y" "http://127.0.0.1:9/x.dtd">)",
+                   kInjected)}},
+     true,
+     "global element name=injected type={xs}string\n",
+     ""},
+    {"ExternalParameterEntity",
+     {{"main.xsd",
+       withDoctype(R"(<!DOCTYPE xs:schema [<!ENTITY % p SYSTEM "p.dtd"> %p;]>)", kInjected)},
+      {"p.dtd", "this is no DTD <!ELEMENT"}},
+     false,
+     "global element name=injected type={xs}string\n",
+     "4 4 Schema: Error: External entity 'p.dtd' in file $DIR/main.xsd is not read\n"},
+};
+
+class Driver : public ::testing::TestWithParam<DriverCase> {};
+
+TEST_P(Driver, ReadsOrFailsWithTheExpectedMessages) {
+    const DriverCase& c = GetParam();
+    TempDir dir;
+    for (const auto& [name, content] : c.files)
+        dir.write(name, content);
+    const ReadOutcome read =
+        readSchemaFile((dir.path() / "main.xsd").string(), dir.path().string());
+    EXPECT_EQ(read.ok, c.ok);
+    EXPECT_EQ(read.model, c.model);
+    expectLog(read.log, c.log);
+}
+
+INSTANTIATE_TEST_SUITE_P(Documents, Driver, ::testing::ValuesIn(kDriverCases),
+                         [](const auto& row) { return std::string(row.param.name); });
+
+// Unopenable paths: the stream cannot be made and the parser says so.
+TEST(Driver, MissingFileAndDirectoryFailWithTheParsersMessage) {
+    TempDir dir;
+    const std::string base = dir.path().string();
+    for (const std::string& path : {base + "/missing.xsd", base}) {
+        SCOPED_TRACE(path);
+        const ReadOutcome read = readSchemaFile(path, base);
+        EXPECT_FALSE(read.ok);
+        expectLog(read.log, "8 4 Schema: Fatal: At line 0, column 0 of file : *'" +
+                                replaceAll(path, base, "$DIR") + "'\n");
+    }
+}
+
+// An error while reading bytes is logged and fails the read; it never reaches
+// the parser as a byte count, which sees the document end there. The kernel
+// refuses to read this file at offset 0.
+TEST(Driver, UnreadableFileFailsTheRead) {
+    const ReadOutcome read = readSchemaFile("/proc/self/mem", "/proc/self");
+    EXPECT_FALSE(read.ok);
+    expectLog(read.log, "4 4 Schema: Error: Reading file $DIR/mem failed\n"
+                        "8 4 Schema: Fatal: At line 1, column 1 of file $DIR/mem: *\n");
+}
+
+TEST(Driver, InitialisationErrorIsReportedAndNothingIsRead) {
+    ZrXmlSchemaBrowser browser;
+    ZrXmlSchemaBrowserTestAccess access(browser);
+    access.initialised() = false;
+    access.initError() = wide("no locale");
+    LogCapture log;
+    EXPECT_FALSE(browser.ReadSchema(u"/nonexistent/schema.xsd", false));
+    EXPECT_EQ(log.lines(), "4 19 SchemaBrowser: Initialization error: no locale\n");
+}
+
+TEST(Driver, DiagnosticsNameThePlaceAndKeepTheTextAfterMessage) {
+    struct Row {
+        void (ZrXmlSchemaBrowser::*callback)(const xercesc::SAXParseException&);
+        const char16_t* message;
+        bool fails;
+        const char* logged;
+    };
+
+    const Row rows[] = {
+        {&ZrXmlSchemaBrowser::warning, u"plain text", false,
+         "2 4 Schema: Warning: At line 3, column 5 of file /s.xsd: plain text\n"},
+        {&ZrXmlSchemaBrowser::error, u"Type:X, Message: the cause", true,
+         "4 4 Schema: Error: At line 3, column 5 of file /s.xsd:  the cause\n"},
+        {&ZrXmlSchemaBrowser::fatalError, u"Message:first Message:second", true,
+         "8 4 Schema: Fatal: At line 3, column 5 of file /s.xsd: first Message:second\n"},
+    };
+    for (const Row& row : rows) {
+        ZrXmlSchemaBrowser browser;
+        ZrXmlSchemaBrowserTestAccess access(browser);
+        LogCapture log;
+        const xercesc::SAXParseException e(row.message, u"", u"/s.xsd", 3, 5);
+        (browser.*row.callback)(e);
+        EXPECT_EQ(log.lines(), row.logged);
+        EXPECT_EQ(access.failed(), row.fails);
+    }
+}
+
+// A read that failed half-way leaves documents queued and a declaration open;
+// the next read on the same browser starts clean all the same.
+TEST(Driver, ABrowserIsReusableAfterAFailedRead) {
+    TempDir dir;
+    const std::string failing =
+        dir.write("failing.xsd", schemaDoc(R"(<xs:include schemaLocation="later.xsd"/>
+                                    <xs:element name="open" nullable="false"><xs:complexType>
+                                    <xs:element name="x" type="xs:string"></xs:complexType>)"));
+    dir.write("later.xsd", schemaDoc(R"(<xs:element name="later" type="xs:string"/>)"));
+    const std::string good =
+        dir.write("good.xsd", schemaDoc(R"(<xs:element name="good" type="xs:string"/>)"));
+    ZrXmlSchemaBrowser browser;
+    ZrXmlSchemaBrowserTestAccess access(browser);
+    LogCapture log;
+    EXPECT_FALSE(browser.ReadSchema(wide(failing).c_str(), false));
+    EXPECT_EQ(access.documentQueue().size(), 1u);
+    EXPECT_FALSE(access.currentElement().nullable);
+    EXPECT_TRUE(browser.ReadSchema(wide(good).c_str(), false));
+    EXPECT_EQ(dumpModel(access), "global element name=good type={xs}string\n");
+    EXPECT_TRUE(access.documentQueue().empty());
+}
+
+// Declarations, types and groups nested without end are refused before the state
+// saved for them grows without bound.
+TEST(Driver, NestingIsBounded) {
+    auto nested = [](int depth) {
+        std::string body;
+        for (int i = 0; i < depth; ++i)
+            body += "<xs:group>";
+        for (int i = 0; i < depth; ++i)
+            body += "</xs:group>";
+        return schemaDoc(body + R"(<xs:element name="after" type="xs:string"/>)");
+    };
+    const ReadOutcome deep = readSchemaText(nested(10001));
+    EXPECT_FALSE(deep.ok);
+    EXPECT_EQ(deep.log,
+              "4 4 Schema: Error: Declarations and types nested deeper than 10000 in file "
+              "$DIR/main.xsd\n");
+    const ReadOutcome fits = readSchemaText(nested(10000));
+    EXPECT_TRUE(fits.ok);
+    EXPECT_EQ(fits.log, "");
+}
+
+// Documents commonly escape text with the predefined entities; they are not
+// counted against the expansion bound.
+TEST(Driver, PredefinedEntitiesAreNotLimited) {
+    std::string text;
+    for (size_t i = 0; i < 2 * kSchemaEntityExpansionLimit; ++i)
+        text += "&lt;&amp;&#65;";
+    const ReadOutcome read = readSchemaText(schemaDoc("<xs:annotation><xs:documentation>" + text +
+                                                      "</xs:documentation></xs:annotation>"));
+    EXPECT_TRUE(read.ok);
+    EXPECT_EQ(read.log, "");
+}
+
+} // namespace
