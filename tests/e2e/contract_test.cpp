@@ -26,6 +26,14 @@ bool startsWith(const std::string& text, const std::string& prefix) {
     return text.compare(0, prefix.size(), prefix) == 0;
 }
 
+// An object's keys in document order.
+std::vector<std::string> keysOf(const Json& object) {
+    std::vector<std::string> keys;
+    for (auto it = object.begin(); it != object.end(); ++it)
+        keys.push_back(it.key());
+    return keys;
+}
+
 struct StatusCase {
     const char* name;
     std::vector<std::string> args;
@@ -62,11 +70,8 @@ const StatusCase kStatusCases[] = {
     {"Help", {"--help"}, 0, nullptr},
     {"CommandHelp", {"flatten", "--help"}, 0, nullptr},
     {"Version", {"--version"}, 0, nullptr},
-    {"Types", {"types"}, 0, nullptr},
     {"PluginBeforeCommand", {"--plugin", pluginPath(), "types"}, 0, nullptr},
     {"PluginAfterCommand", {"options", "--plugin", pluginPath()}, 0, nullptr},
-    {"OptionLowerCase", {"options", "--option", "qualifiedrecordnames=true"}, 0, nullptr},
-    {"ReadExample", {"read", example()}, 0, nullptr},
     {"ReadMissingFile", {"read", "/nonexistent/missing.xsd"}, 19, "fatal 4: Schema: Fatal: "},
     {"FlattenExample", {"flatten", "--spoke", "text", example(), "item"}, 0, nullptr},
     {"FlattenMissingFile", {"flatten", "/nonexistent/missing.xsd", "item"}, 19, nullptr},
@@ -171,26 +176,15 @@ TEST(Read, JsonShapeOfRecordsAndFields) {
     RunResult run = runZrdict({"read", "--format", "json", example()});
     ASSERT_EQ(run.exitStatus, 0) << run.out << run.err;
     Json doc = run.json();
-    std::vector<std::string> keys;
-    for (auto it = doc.begin(); it != doc.end(); ++it)
-        keys.push_back(it.key());
-    EXPECT_EQ(keys, (std::vector<std::string>{"status", "records", "messages"}));
+    EXPECT_EQ(keysOf(doc), (std::vector<std::string>{"status", "records", "messages"}));
     ASSERT_FALSE(doc["records"].empty());
     const Json& record = doc["records"][0];
     EXPECT_EQ(record["name"], "purchaseOrder");
-    keys.clear();
-    for (auto it = record.begin(); it != record.end(); ++it)
-        keys.push_back(it.key());
-    EXPECT_EQ(keys, (std::vector<std::string>{"name", "length", "fields"}));
+    EXPECT_EQ(keysOf(record), (std::vector<std::string>{"name", "length", "fields"}));
     ASSERT_FALSE(record["fields"].empty());
     const Json& field = record["fields"][0];
-    keys.clear();
-    for (auto it = field.begin(); it != field.end(); ++it)
-        keys.push_back(it.key());
-    EXPECT_EQ(keys, (std::vector<std::string>{"name", "alias", "description", "type"}));
-    keys.clear();
-    for (auto it = field["type"].begin(); it != field["type"].end(); ++it)
-        keys.push_back(it.key());
+    EXPECT_EQ(keysOf(field), (std::vector<std::string>{"name", "alias", "description", "type"}));
+    std::vector<std::string> keys = keysOf(field["type"]);
     ASSERT_GE(keys.size(), 7u);
     keys.resize(7);
     EXPECT_EQ(keys, (std::vector<std::string>{"class", "alias", "usage", "length", "precision",
@@ -233,10 +227,8 @@ TEST(Options, AreAppliedInOrder) {
 
     const Row rows[] = {
         {{"QualifiedRecordNames=True"}, "True"},
-        {{"qualifiedrecordnames=true"}, "True"},
         {{"QualifiedRecordNames=True", "QualifiedRecordNames=False"}, "False"},
         {{"QualifiedRecordNames=False", "QUALIFIEDRECORDNAMES=TRUE"}, "True"},
-        {{"QualifiedRecordNames=yes"}, "False"},
         {{"QualifiedRecordNames="}, "False"},
     };
     for (const Row& row : rows) {
@@ -270,47 +262,20 @@ TEST(Types, JsonListsTheBuiltinTable) {
     ASSERT_EQ(types.size(), 95u);
     for (size_t i = 0; i < types.size(); ++i) {
         const Json& entry = types[i];
-        std::vector<std::string> keys;
-        for (auto it = entry.begin(); it != entry.end(); ++it)
-            keys.push_back(it.key());
-        EXPECT_EQ(keys,
+        EXPECT_EQ(keysOf(entry),
                   (std::vector<std::string>{"index", "definition", "class", "alias", "usage"}));
         EXPECT_EQ(entry["index"], i);
         // Entries 50 on are the attribute variants: element usage + 256.
         EXPECT_EQ(entry["usage"].get<int>() >= 256, i >= 50 || i == 1 || i == 4) << i;
     }
 
-    struct Row {
-        int index;
-        const char* definition;
-        const char* typeClass;
-        const char* alias;
-        int usage;
-    };
-
-    const Row rows[] = {
-        {0, "Text;alias=Character;padchar_invalid;usage=0", "Text", "Character", 0},
-        {2, "Structure;alias=Record;usage=2", "Structure", "Record", 2},
-        {4, "Text;alias='Unquoted attribute';padchar_invalid;usage=259", "Text",
-         "Unquoted attribute", 259},
-        {35,
-         "Number;alias=int;signed_invalid;display;maxlength=32;precision=10;scale_invalid;"
-         "usage=48",
-         "Number", "int", 48},
-        {55,
-         "DateTime;alias='duration attribute';length_invalid;precision_invalid;"
-         "picture='yyyy-mm-ddTH24:MM:SS';usage=277",
-         "DateTime", "duration attribute", 277},
-        {94, "Text;alias='base64Binary attribute';padchar_invalid;usage=321", "Text",
-         "base64Binary attribute", 321},
-    };
-    for (const Row& row : rows) {
-        const Json& entry = types[static_cast<size_t>(row.index)];
-        EXPECT_EQ(entry["definition"], row.definition) << row.index;
-        EXPECT_EQ(entry["class"], row.typeClass) << row.index;
-        EXPECT_EQ(entry["alias"], row.alias) << row.index;
-        EXPECT_EQ(entry["usage"], row.usage) << row.index;
-    }
+    // Quoted aliases and a picture come through whole.
+    EXPECT_EQ(types[4], Json::parse(R"({"index": 4, "definition":
+        "Text;alias='Unquoted attribute';padchar_invalid;usage=259", "class": "Text",
+        "alias": "Unquoted attribute", "usage": 259})"));
+    EXPECT_EQ(types[55], Json::parse(R"({"index": 55, "definition":
+        "DateTime;alias='duration attribute';length_invalid;precision_invalid;picture='yyyy-mm-ddTH24:MM:SS';usage=277",
+        "class": "DateTime", "alias": "duration attribute", "usage": 277})"));
 }
 
 TEST(Types, TextListsOneLinePerType) {
@@ -321,32 +286,6 @@ TEST(Types, TextListsOneLinePerType) {
         lines += c == '\n';
     EXPECT_EQ(lines, 96u) << "a heading and 95 types:\n" << run.out;
     EXPECT_TRUE(contains(run.out, "'string attribute'")) << run.out;
-}
-
-TEST(Flatten, TextSpokeTurnsEveryFieldIntoTextOfItsLength) {
-    RunResult plain = runZrdict({"flatten", "--format", "json", example(), "item"});
-    RunResult text =
-        runZrdict({"flatten", "--format", "json", "--spoke", "text", example(), "item"});
-    ASSERT_EQ(plain.exitStatus, 0) << plain.out;
-    ASSERT_EQ(text.exitStatus, 0) << text.out;
-    Json plainRecord = plain.json()["records"].at(0);
-    Json textRecord = text.json()["records"].at(0);
-    EXPECT_EQ(textRecord["name"], "item");
-    ASSERT_EQ(plainRecord["fields"].size(), textRecord["fields"].size());
-    ASSERT_FALSE(textRecord["fields"].empty());
-    long sum = 0;
-    for (size_t i = 0; i < textRecord["fields"].size(); ++i) {
-        const Json& before = plainRecord["fields"][i];
-        const Json& after = textRecord["fields"][i];
-        EXPECT_EQ(after["name"], before["name"]);
-        EXPECT_EQ(after["alias"], before["name"]);
-        EXPECT_EQ(after["type"]["class"], "Text");
-        EXPECT_EQ(after["type"]["alias"], "Character");
-        EXPECT_EQ(after["type"]["usage"], 0);
-        EXPECT_EQ(after["type"]["length"], before["type"]["length"]);
-        sum += after["type"]["length"].get<long>();
-    }
-    EXPECT_EQ(textRecord["length"], sum);
 }
 
 // A copy of zrdict in a directory of its own: it looks beside itself first and

@@ -21,15 +21,10 @@ public:
     bool& initialised() { return b.initialised; }
     bool& failed() { return b.failed; }
     ZrWString& initError() { return b.initError; }
-    int32_t& skipDepth() { return b.skipDepth; }
-    bool& qualifiedRecords() { return b.qualifiedRecords; }
     ElementDef& currentElement() { return b.currentElement; }
-    std::vector<ElementDef>& elementStack() { return b.elementStack; }
     NamedList<ElementDef>& globalElements() { return b.globalElements; }
     ComplexTypeDef& currentComplexType() { return b.currentComplexType; }
-    std::vector<ComplexTypeDef>& complexTypeStack() { return b.complexTypeStack; }
     NamedList<ComplexTypeDef>& complexTypes() { return b.complexTypes; }
-    int32_t& complexDepth() { return b.complexDepth; }
     int32_t& anonCounter() { return b.anonCounter; }
     SimpleTypeDef& currentSimpleType() { return b.currentSimpleType; }
     NamedList<SimpleTypeDef>& simpleTypes() { return b.simpleTypes; }
@@ -61,7 +56,6 @@ public:
     bool lookupType(const XMLCh* local, const XMLCh* ns, ZrDType& type) {
         return b.lookupType(local, ns, type);
     }
-    bool resolveSimpleType(SimpleTypeDef& type) { return b.resolveSimpleType(type); }
     void dtLimits(ZrDType& type, const XMLCh* minInc, const XMLCh* maxInc, const XMLCh* minExc,
                   const XMLCh* maxExc) {
         b.dtLimits(type, minInc, maxInc, minExc, maxExc);

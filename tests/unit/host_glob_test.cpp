@@ -57,12 +57,6 @@ const FormatCase kFormatCases[] = {
     {"WidthAndPrecision",
      [] { return narrowFormat("[%5d][%-4s][%.2s][%03d]", 42, "ab", "xyz", -5); },
      "[   42][ab  ][xy][-05]"},
-    {"MessageFormats",
-     [] {
-         return wideFormat(u"Schema: Error: At line %d, column %d of file %s: %s", 3, 5, u"a.xsd",
-                           u" bad");
-     },
-     "Schema: Error: At line 3, column 5 of file a.xsd:  bad"},
 };
 
 class Formatting : public ::testing::TestWithParam<FormatCase> {};

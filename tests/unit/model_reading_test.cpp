@@ -39,18 +39,6 @@ const ModelCase kModelCases[] = {
      "global element name=e type={xs}string\n"
      "complexType anon0\n",
      ""},
-    {"NullableIsInheritedByNestedDeclarations", "",
-     R"(<xs:element name="outer" nullable="false"><xs:complexType><xs:sequence>
-          <xs:element name="inner" type="xs:string"/>
-          <xs:element name="other" type="xs:string" nullable="TRUE"/>
-        </xs:sequence></xs:complexType></xs:element>
-        <xs:element name="sibling" type="xs:string"/>)",
-     "global element name=outer type=anon0 !nullable\n"
-     "global element name=sibling type={xs}string\n"
-     "complexType anon0\n"
-     "  element name=inner type={xs}string !nullable\n"
-     "  element name=other type={xs}string\n",
-     ""},
     {"NullableIsFalseOnlyForFalseInAnyCase", "",
      R"(<xs:element name="a" type="xs:string" nullable="False"/>
         <xs:element name="b" type="xs:string" nullable="FALSE"/>
@@ -281,33 +269,24 @@ TEST_P(ModelReading, ReadsTheSameModelWholeAndByteByByte) {
 INSTANTIATE_TEST_SUITE_P(Schemas, ModelReading, ::testing::ValuesIn(kModelCases),
                          [](const auto& row) { return std::string(row.param.name); });
 
-TEST(ModelReading, PrefixedAndDefaultNamespaceSchemasReadAlike) {
-    const std::string prefixed = schemaDoc(
-        R"(<xs:element name="e"><xs:complexType><xs:sequence>
-             <xs:element name="a" type="xs:string"/></xs:sequence>
-             <xs:attribute name="b"><xs:simpleType><xs:restriction base="xs:int">
-               <xs:maxInclusive value="5"/></xs:restriction></xs:simpleType></xs:attribute>
-           </xs:complexType></xs:element>)",
-        R"(targetNamespace="urn:t")");
-    const std::string plain = std::string("<?xml version=\"1.0\"?>\n<schema xmlns=\"") + kXsdNs +
-                              R"(" xmlns:xs=")" + kXsdNs + R"(" targetNamespace="urn:t">
+// The XML Schema namespace as the default namespace reads like the prefixed form
+// every other case uses.
+TEST(ModelReading, DefaultNamespaceSchemaReadsLikeAPrefixedOne) {
+    const ReadOutcome read =
+        readSchemaText(std::string("<?xml version=\"1.0\"?>\n<schema xmlns=\"") + kXsdNs +
+                       R"(" xmlns:xs=")" + kXsdNs + R"(" targetNamespace="urn:t">
            <element name="e"><complexType><sequence>
              <element name="a" type="string"/></sequence>
              <attribute name="b"><simpleType><restriction base="int">
                <maxInclusive value="5"/></restriction></simpleType></attribute>
-           </complexType></element></schema>)";
-    const ReadOutcome a = readSchemaText(prefixed);
-    const ReadOutcome b = readSchemaText(plain);
-    EXPECT_TRUE(a.ok);
-    EXPECT_TRUE(b.ok);
-    EXPECT_EQ(a.model, b.model);
-    EXPECT_EQ(a.log, "");
-    EXPECT_EQ(b.log, "");
-    EXPECT_EQ(a.model, "global element name={urn:t}e type=anon0\n"
-                       "complexType anon0\n"
-                       "  element name={urn:t}a type={xs}string\n"
-                       "  attribute name={urn:t}b type=anon1\n"
-                       "simpleType anon1 base={xs}int maxInclusive=5\n");
+           </complexType></element></schema>)");
+    EXPECT_TRUE(read.ok);
+    EXPECT_EQ(read.log, "");
+    EXPECT_EQ(read.model, "global element name={urn:t}e type=anon0\n"
+                          "complexType anon0\n"
+                          "  element name={urn:t}a type={xs}string\n"
+                          "  attribute name={urn:t}b type=anon1\n"
+                          "simpleType anon1 base={xs}int maxInclusive=5\n");
 }
 
 // Facets inside a complex type's restriction reach only the working simple type,
@@ -344,31 +323,17 @@ TEST(ModelReading, RereadingGivesTheSameModel) {
     EXPECT_EQ(access.anonCounter(), 2);
 }
 
-TEST(ModelLookup, FindsTheFirstTypeAndAnonNamesInAnyNamespace) {
+// Null names are accepted: a generated-looking name is found whatever the
+// namespace, no name finds nothing (the index is checked in model_index_lookup.cpp).
+TEST(ModelLookup, NullNamesAndNamespaces) {
     ZrXmlSchemaBrowser browser;
     ZrXmlSchemaBrowserTestAccess access(browser);
-    auto add = [&](const char* name, const char* ns, bool group) {
-        ComplexTypeDef t;
-        t.name = wide(name);
-        t.nameNs = wide(ns);
-        t.isGroup = group;
-        t.baseName = wide(std::to_string(access.complexTypes().size()));
-        access.complexTypes().push_back(t);
-    };
-    add("T", "urn:a", true);
-    add("T", "urn:a", false);
-    add("T", "urn:b", false);
-    add("anonymous", "urn:c", false);
-    auto find = [&](const char16_t* name, const char16_t* ns) -> std::string {
-        const ComplexTypeDef* t = access.findComplexType(name, ns);
-        return t ? utf8(t->baseName) : "none";
-    };
-    EXPECT_EQ(find(u"T", u"urn:a"), "0");
-    EXPECT_EQ(find(u"T", u"urn:b"), "2");
-    EXPECT_EQ(find(u"T", u""), "none");
-    EXPECT_EQ(find(u"anonymous", u"urn:other"), "3");
-    EXPECT_EQ(find(u"anonymous", nullptr), "3");
-    EXPECT_EQ(find(nullptr, nullptr), "none");
+    ComplexTypeDef t;
+    t.name = u"anonymous";
+    t.nameNs = u"urn:c";
+    access.complexTypes().push_back(t);
+    EXPECT_EQ(access.findComplexType(u"anonymous", nullptr), &access.complexTypes()[0]);
+    EXPECT_EQ(access.findComplexType(nullptr, nullptr), nullptr);
 }
 
 TEST(ModelRecords, ClearKeepsWhatTheReaderReliesOn) {

@@ -1,5 +1,5 @@
-// The parse driver: failed reads, parser diagnostics, input that must not be
-// trusted (entities, DTDs, unreadable files, deep nesting).
+// The parse driver: failed reads, parser diagnostics, unreadable files, nesting
+// and entity bounds at their edges (hostile documents have tests of their own).
 #include "ParserConfig.h"
 #include "model_dump.h"
 
@@ -57,22 +57,6 @@ struct DriverCase {
     const char* log;
 };
 
-const std::string kBillionLaughs = R"(<?xml version="1.0"?>
-<!DOCTYPE xs:schema [
- <!ENTITY a "aaaaaaaaaa">
- <!ENTITY b "&a;&a;&a;&a;&a;&a;&a;&a;&a;&a;">
- <!ENTITY c "&b;&b;&b;&b;&b;&b;&b;&b;&b;&b;">
- <!ENTITY d "&c;&c;&c;&c;&c;&c;&c;&c;&c;&c;">
- <!ENTITY e "&d;&d;&d;&d;&d;&d;&d;&d;&d;&d;">
- <!ENTITY f "&e;&e;&e;&e;&e;&e;&e;&e;&e;&e;">
- <!ENTITY g "&f;&f;&f;&f;&f;&f;&f;&f;&f;&f;">
- <!ENTITY h "&g;&g;&g;&g;&g;&g;&g;&g;&g;&g;">
- <!ENTITY i "&h;&h;&h;&h;&h;&h;&h;&h;&h;&h;">
- <!ENTITY j "&i;&i;&i;&i;&i;&i;&i;&i;&i;&i;">
-]>
-<xs:schema xmlns:xs="http://www.w3.org/2001/XMLSchema">
-)";
-
 std::string withDoctype(const std::string& doctype, const std::string& body) {
     return "<?xml version=\"1.0\"?>\n" + doctype + "\n<xs:schema xmlns:xs=\"" + kXsdNs + "\">\n" +
            body + "\n</xs:schema>\n";
@@ -109,58 +93,6 @@ const DriverCase kDriverCases[] = {
      false,
      "",
      "8 4 Schema: Fatal: At line 0, column 0 of file : *'$DIR/missing.xsd'\n"},
-    {"BillionLaughsInContent",
-     {{"main.xsd", kBillionLaughs + "<xs:annotation>&j;</xs:annotation></xs:schema>\n"}},
-     false,
-     "",
-     "8 4 Schema: Fatal: At line *, column * of file $DIR/main.xsd: *entity expansion*\n"},
-    {"BillionLaughsInAttribute",
-     {{"main.xsd", kBillionLaughs + "<xs:element name=\"&j;\"/></xs:schema>\n"}},
-     false,
-     "",
-     "8 4 Schema: Fatal: At line *, column * of file $DIR/main.xsd: *entity expansion*\n"},
-    {"LongEntityDeclaration",
-     {{"main.xsd", withDoctype("<!DOCTYPE xs:schema [<!ENTITY big \"" +
-                                   std::string(kSchemaEntityValueLimit + 1, 'x') + "\">]>",
-                               "<xs:element name=\"&big;\"/>")}},
-     false,
-     "",
-     "4 4 Schema: Error: Entity 'big' in file $DIR/main.xsd is longer than 4096 characters\n"},
-    {"ExternalEntityFromDisk",
-     {{"main.xsd",
-       withDoctype(R"(<!DOCTYPE xs:schema [<!ENTITY ext SYSTEM "ext.xml">]>)", "&ext;")},
-      {"ext.xml", kInjected}},
-     false,
-     "",
-     "4 4 Schema: Error: External entity 'ext.xml' in file $DIR/main.xsd is not read\n"},
-    {"ExternalEntityFromNetwork",
-     {{"main.xsd", withDoctype(R"(<!DOCTYPE xs:schema [
-            <!ENTITY ext PUBLIC "-//x//y" "http://127.0.0.1:9/ext.xml">]>)",
-                               "&ext;")}},
-     false,
-     "",
-     "4 4 Schema: Error: External entity 'http://127.0.0.1:9/ext.xml' in file $DIR/main.xsd "
-     "is not read\n"},
-    {"ExternalDtdFromDiskIsIgnored",
-     {{"main.xsd", withDoctype(R"(<!DOCTYPE xs:schema SYSTEM "bad.dtd">)", kInjected)},
-      {"bad.dtd", "this is no DTD <!ELEMENT"}},
-     true,
-     "global element name=injected type={xs}string\n",
-     ""},
-    {"ExternalDtdFromNetworkIsIgnored",
-     {{"main.xsd",
-       withDoctype(R"(<!DOCTYPE xs:schema PUBLIC "-//x//y" "http://127.0.0.1:9/x.dtd">)",
-                   kInjected)}},
-     true,
-     "global element name=injected type={xs}string\n",
-     ""},
-    {"ExternalParameterEntity",
-     {{"main.xsd",
-       withDoctype(R"(<!DOCTYPE xs:schema [<!ENTITY % p SYSTEM "p.dtd"> %p;]>)", kInjected)},
-      {"p.dtd", "this is no DTD <!ELEMENT"}},
-     false,
-     "global element name=injected type={xs}string\n",
-     "4 4 Schema: Error: External entity 'p.dtd' in file $DIR/main.xsd is not read\n"},
 };
 
 class Driver : public ::testing::TestWithParam<DriverCase> {};

@@ -134,19 +134,6 @@ TEST(Includes, RelativeAndAbsoluteMainPaths) {
     }
 }
 
-// A location with a protocol is used as written and never fetched: the file
-// proxy reads local files only, so the read fails.
-TEST(Includes, LocationWithAProtocolIsNotFetched) {
-    TempDir dir;
-    dir.write("main.xsd", doc("main", {"http://127.0.0.1:9/types.xsd"}));
-    const ReadOutcome read =
-        readSchemaFile((dir.path() / "main.xsd").string(), dir.path().string());
-    EXPECT_FALSE(read.ok);
-    EXPECT_EQ(read.log.rfind("8 4 Schema: Fatal: At line 0, column 0 of file : ", 0), 0u)
-        << read.log;
-    EXPECT_NE(read.log.find("'http://127.0.0.1:9/types.xsd'"), std::string::npos) << read.log;
-}
-
 // Included documents share the namespace state: one without targetNamespace keeps
 // the including document's, and a prefix declared again is rebound.
 TEST(Includes, NamespaceStateCarriesOver) {

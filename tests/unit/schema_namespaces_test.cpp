@@ -1,5 +1,4 @@
 // Namespace state, name resolution and the first element's attributes.
-#include "ZrXmlQName.h"
 #include "model_dump.h"
 
 #include <gtest/gtest.h>
@@ -126,16 +125,6 @@ TEST(Namespaces, ElementsBeforeAnySchemaElementAreReported) {
                         "512 0 Element 'element' not in XMLSchema namespace (is "
                         "'http://www.w3.org/2001/XMLSchema', should be ''\n"
                         "512 0 xmlns in element attrs\n");
-}
-
-TEST(QName, DefaultIsNullAndCopiesCarryBothParts) {
-    ZrXmlQName empty;
-    EXPECT_TRUE(empty.isNull());
-    EXPECT_EQ(empty.localPart().size(), 0);
-    ZrXmlQName copy(empty);
-    EXPECT_TRUE(copy.isNull());
-    copy = empty;
-    EXPECT_TRUE(copy.isNull());
 }
 
 } // namespace
