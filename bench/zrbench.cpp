@@ -208,8 +208,8 @@ class FloorHandler : public HandlerBase {
 // Parses `mainPath` and every document it includes, once each, in the reader's
 // order. Returns the documents parsed; throws when one of them fails.
 std::vector<std::string> runFloor(const std::string& mainPath) {
-    SAXParser parser(nullptr, XMLPlatformUtils::fgMemoryManager);
-    configureSchemaParser(parser);
+    // The reader's own parser class: the same configuration and the same DTD hooks.
+    SchemaParser parser;
     FloorHandler handler;
     parser.setDocumentHandler(&handler);
     parser.setErrorHandler(&handler);

@@ -106,6 +106,7 @@ ZrRecord* ZrXmlSchemaBrowser::buildRecord(const ElementDef& declaration) {
     record->name = name;
     recordsByName.emplace(std::move(name), record);
     recordWorkList.push_back(qualified);
+    fieldNamesOfOpenRecords.emplace_back(record, std::unordered_set<ZrWString>());
 
     bool built = false;
     const ComplexTypeDef* type =
@@ -120,8 +121,22 @@ ZrRecord* ZrXmlSchemaBrowser::buildRecord(const ElementDef& declaration) {
             built = addField(*it, record);
     }
     // A failed record stays in the list with the fields added so far; the read fails.
+    fieldNamesOfOpenRecords.pop_back();
     recordWorkList.pop_back();
     return built ? record : nullptr;
+}
+
+// Fields are added only to the innermost record under construction; any other record
+// (one a caller hands in directly) is searched.
+bool ZrXmlSchemaBrowser::recordHasField(const ZrRecord* record, const ZrWString& name) const {
+    if (!fieldNamesOfOpenRecords.empty() && fieldNamesOfOpenRecords.back().first == record)
+        return fieldNamesOfOpenRecords.back().second.count(name) != 0;
+    return record->GetFieldbyName(name) != nullptr;
+}
+
+void ZrXmlSchemaBrowser::noteField(const ZrRecord* record, const ZrWString& name) {
+    if (!fieldNamesOfOpenRecords.empty() && fieldNamesOfOpenRecords.back().first == record)
+        fieldNamesOfOpenRecords.back().second.insert(name);
 }
 
 // Draws in what `type` inherits: the text field of simple content, or the whole base
@@ -199,8 +214,10 @@ bool ZrXmlSchemaBrowser::addField(const ElementDef& declaration, ZrRecord* recor
             return false;
         // A record met again (a recursive type, or a name shared under unqualified
         // record names) gets one field in its parent, not one per occurrence.
-        if (!record->GetFieldbyName(nested->name))
+        if (!recordHasField(record, nested->name)) {
             record->NewField(recordType, nested->name);
+            noteField(record, nested->name);
+        }
         return true;
     }
     return addSimpleField(declaration, record);
@@ -252,11 +269,20 @@ bool ZrXmlSchemaBrowser::addGroup(const ElementDef& reference, ZrRecord* record)
 }
 
 bool ZrXmlSchemaBrowser::addSimpleField(const ElementDef& declaration, ZrRecord* record) {
-    const ZrWString field = qualifiedName(declaration.nameNs, declaration.name, false);
+    ZrWString field = qualifiedName(declaration.nameNs, declaration.name, false);
     // The type name goes through its text form and back, as a prefixed name would.
-    const ZrWString typeText = qualifiedName(declaration.typeNs, declaration.typeName, true);
-    ZrWString local;
-    ZrWString ns;
+    // The buffers are members, reused field after field: nothing below builds a
+    // field, so they are not overwritten before the failure message names them.
+    ZrWString& typeText = fieldTypeText;
+    typeText = declaration.typeName.view();
+    if (const XMLCh* prefix = ReverseNamespace(declaration.typeNs.c_str(), true);
+        prefix && *prefix) {
+        typeText = std::u16string_view(prefix);
+        typeText += u':';
+        typeText += declaration.typeName;
+    }
+    ZrWString& local = fieldTypeLocal;
+    ZrWString& ns = fieldTypeNs;
     parseName(typeText.c_str(), true, local, ns);
     if (local.empty())
         local = u"string";
@@ -276,8 +302,9 @@ bool ZrXmlSchemaBrowser::addSimpleField(const ElementDef& declaration, ZrRecord*
             type.Alias(variant->Alias());
     }
     type.Nulls(declaration.nullable);
+    noteField(record, field);
     // The host's NewField fails only by throwing bad_alloc, so its result needs no test.
-    record->NewField(type, field);
+    record->NewField(type, std::move(field));
     return true;
 }
 

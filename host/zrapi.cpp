@@ -97,6 +97,13 @@ ZrField* ZrRecord::NewField(const ZrDType& type, const ZrWString& fieldName) {
     return fields_.back().get();
 }
 
+ZrField* ZrRecord::NewField(const ZrDType& type, ZrWString&& fieldName) {
+    auto field = std::make_unique<ZrField>(type);
+    field->FieldName(std::move(fieldName));
+    fields_.push_back(std::move(field));
+    return fields_.back().get();
+}
+
 ZrField* ZrRecord::GetFieldbyName(const ZrWString& fieldName) const {
     for (const auto& field : fields_)
         if (field->FieldName() == fieldName)
@@ -164,6 +171,19 @@ ZrRecord* ZrRecordList::AddRecord(const ZrRecord* record, int position) {
     } catch (const std::bad_alloc&) {
         return nullptr;
     }
+}
+
+void ZrRecordList::TakeAll(ZrRecordList& source) {
+    if (&source == this)
+        return;
+    if (records_.empty()) {
+        records_.swap(source.records_);
+        return;
+    }
+    records_.reserve(records_.size() + source.records_.size());
+    for (auto& record : source.records_)
+        records_.push_back(std::move(record));
+    source.records_.clear();
 }
 
 // ---------------------------------------------------------------------------

@@ -7,6 +7,7 @@
 #include "zrtypes.h"
 
 #include <memory>
+#include <utility>
 #include <vector>
 
 // A connector. Plug-ins only ask it to translate data types.
@@ -29,6 +30,7 @@ public:
     ZrDType& DataType() { return type_; }
     const ZrDType& DataType() const { return type_; }
     void FieldName(const ZrWString& name) { name_ = name; }
+    void FieldName(ZrWString&& name) { name_ = std::move(name); }
     const ZrWString& FieldName() const { return name_; }
     void Alias(const ZrWString& alias) { alias_ = alias; }
     const ZrWString& Alias() const { return alias_; }
@@ -78,6 +80,8 @@ public:
 
     // Appends a field holding copies of `type` and `name`; returns it.
     ZrField* NewField(const ZrDType& type, const ZrWString& name);
+    // The same, taking over `name`'s text.
+    ZrField* NewField(const ZrDType& type, ZrWString&& name);
     // First field of that name, or null.
     ZrField* GetFieldbyName(const ZrWString& name) const;
     // Null when `pos` is out of range.
@@ -109,6 +113,10 @@ public:
     // `position` -1 (or past the end) appends. Returns the record held by the list,
     // or null when memory runs out.
     ZrRecord* AddRecord(const ZrRecord* record, int position);
+    // Moves every record of `source`, in order, to the end of this list and leaves
+    // `source` empty; the records themselves stay where they are. Throws bad_alloc,
+    // both lists unchanged, when memory runs out.
+    void TakeAll(ZrRecordList& source);
 
 private:
     std::vector<std::unique_ptr<ZrRecord>> records_;

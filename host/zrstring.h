@@ -17,7 +17,7 @@ public:
     ZrWString(const ZrWChar* text, long len = -1) { set(text, len); }
     explicit ZrWString(std::u16string_view text) : s_(text) {}
     explicit ZrWString(std::u16string&& text) noexcept : s_(std::move(text)) {}
-    virtual ~ZrWString() = default;
+    ~ZrWString() = default;
 
     ZrWString& operator=(const ZrWString&) = default;
     ZrWString& operator=(ZrWString&&) noexcept = default;
@@ -104,7 +104,7 @@ public:
     ZrString(const char* text) : s_(text ? text : "") {}
     ZrString(const ZrString&) = default;
     ZrString(ZrString&&) noexcept = default;
-    virtual ~ZrString() = default;
+    ~ZrString() = default;
 
     ZrString& operator=(const ZrString&) = default;
     ZrString& operator=(ZrString&&) noexcept = default;
@@ -147,7 +147,7 @@ public:
     ZrXString(const ZrWChar* text, long len, ZR_CSET cset = ZR_CSET_DEFAULT);
     ZrXString(const ZrXString&) = default;
     ZrXString(ZrXString&&) noexcept = default;
-    virtual ~ZrXString() = default;
+    ~ZrXString() = default;
     ZrXString& operator=(const ZrXString&) = default;
     ZrXString& operator=(ZrXString&&) noexcept = default;
 

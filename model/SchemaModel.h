@@ -96,7 +96,9 @@ inline bool isAnonName(std::u16string_view name) {
 
 // An insertion-ordered list of named components with lookups that answer exactly
 // what a first-match scan from the start would, in constant time. Entries are held
-// in a deque, so references stay valid while entries are appended.
+// in a deque, so references stay valid while entries are appended. The indexes hold
+// positions only and compare against the entries themselves, so a lookup allocates
+// nothing; an entry's name must not change while it is in the list.
 template <class T> class NamedList {
 public:
     using iterator = typename std::deque<T>::iterator;
@@ -113,9 +115,10 @@ public:
     // Removes the last entry and its index entries.
     void pop_back() {
         const size_t last = items_.size() - 1;
-        unindex(byQName_, qkey(items_.back().name.view(), items_.back().nameNs.view()), last);
-        if (isAnonName(items_.back().name.view()))
-            unindex(byName_, std::u16string(items_.back().name.view()), last);
+        const T& item = items_.back();
+        byQName_.erase(qhash(item.name.view(), item.nameNs.view()), last);
+        if (isAnonName(item.name.view()))
+            byName_.erase(nhash(item.name.view()), last);
         items_.pop_back();
     }
     void clear() {
@@ -136,43 +139,127 @@ public:
     // First entry whose name equals `name` and, unless `name` begins with "anon",
     // whose nameNs equals `ns`; null when none.
     T* find(std::u16string_view name, std::u16string_view ns) {
-        if (isAnonName(name))
-            return at(byName_, std::u16string(name));
+        if (isAnonName(name)) {
+            const size_t pos = byName_.find(nhash(name), [&](size_t at) {
+                return items_[at].name.view() == name;
+            });
+            return pos == npos ? nullptr : &items_[pos];
+        }
         return findExact(name, ns);
     }
     // First entry whose name and nameNs equal `name` and `ns`; null when none.
     T* findExact(std::u16string_view name, std::u16string_view ns) {
-        return at(byQName_, qkey(name, ns));
+        const size_t pos = byQName_.find(qhash(name, ns), [&](size_t at) {
+            return items_[at].name.view() == name && items_[at].nameNs.view() == ns;
+        });
+        return pos == npos ? nullptr : &items_[pos];
     }
 
 private:
-    using Index = std::unordered_map<std::u16string, size_t>;
+    static constexpr size_t npos = static_cast<size_t>(-1);
 
-    static std::u16string qkey(std::u16string_view name, std::u16string_view ns) {
-        std::u16string key;
-        key.reserve(name.size() + ns.size() + 1);
-        key.append(ns).push_back(u'\0');
-        key.append(name);
-        return key;
+    // Open addressing with linear probing over (hash, position) slots. Only the
+    // first position of each key is held: later equal entries are never answers.
+    class PositionIndex {
+    public:
+        template <class Eq> size_t find(size_t hash, Eq&& matches) const {
+            if (slots_.empty())
+                return npos;
+            const size_t mask = slots_.size() - 1;
+            for (size_t i = hash & mask;; i = (i + 1) & mask) {
+                const Slot& slot = slots_[i];
+                if (slot.pos == npos)
+                    return npos;
+                if (slot.hash == hash && matches(slot.pos))
+                    return slot.pos;
+            }
+        }
+        // Adds `pos` under `hash` unless an entry that matches is held already.
+        template <class Eq> void insertFirst(size_t hash, size_t pos, Eq&& matches) {
+            if (find(hash, matches) != npos)
+                return;
+            if ((count_ + 1) * 4 > slots_.size() * 3)
+                grow();
+            place(hash, pos);
+            ++count_;
+        }
+        // Removes the slot holding exactly `pos`, if any; backward-shift deletion
+        // keeps every remaining key reachable from its home slot.
+        void erase(size_t hash, size_t pos) {
+            if (slots_.empty())
+                return;
+            const size_t mask = slots_.size() - 1;
+            size_t i = hash & mask;
+            for (;; i = (i + 1) & mask) {
+                if (slots_[i].pos == npos)
+                    return;
+                if (slots_[i].pos == pos)
+                    break;
+            }
+            size_t hole = i;
+            for (size_t j = (hole + 1) & mask; slots_[j].pos != npos; j = (j + 1) & mask) {
+                const size_t home = slots_[j].hash & mask;
+                // Moves j into the hole unless its home lies cyclically in (hole, j].
+                const bool stays = hole <= j ? (home > hole && home <= j) : (home > hole || home <= j);
+                if (!stays) {
+                    slots_[hole] = slots_[j];
+                    hole = j;
+                }
+            }
+            slots_[hole].pos = npos;
+            --count_;
+        }
+        void clear() {
+            slots_.clear();
+            count_ = 0;
+        }
+
+    private:
+        struct Slot {
+            size_t hash = 0;
+            size_t pos = npos;
+        };
+
+        void place(size_t hash, size_t pos) {
+            const size_t mask = slots_.size() - 1;
+            size_t i = hash & mask;
+            while (slots_[i].pos != npos)
+                i = (i + 1) & mask;
+            slots_[i] = Slot{hash, pos};
+        }
+        void grow() {
+            std::vector<Slot> old(slots_.empty() ? 16 : slots_.size() * 2);
+            old.swap(slots_);
+            for (const Slot& slot : old)
+                if (slot.pos != npos)
+                    place(slot.hash, slot.pos);
+        }
+
+        std::vector<Slot> slots_;
+        size_t count_ = 0;
+    };
+
+    static size_t nhash(std::u16string_view name) {
+        return std::hash<std::u16string_view>()(name);
     }
-    T* at(const Index& index, const std::u16string& key) {
-        auto it = index.find(key);
-        return it == index.end() ? nullptr : &items_[it->second];
-    }
-    static void unindex(Index& index, const std::u16string& key, size_t pos) {
-        auto it = index.find(key);
-        if (it != index.end() && it->second == pos)
-            index.erase(it);
+    static size_t qhash(std::u16string_view name, std::u16string_view ns) {
+        const size_t h = nhash(name);
+        return h ^ (nhash(ns) + 0x9e3779b97f4a7c15ull + (h << 6) + (h >> 2));
     }
     void indexLast() {
         const size_t last = items_.size() - 1;
         const T& item = items_.back();
-        byQName_.emplace(qkey(item.name.view(), item.nameNs.view()), last);
-        if (isAnonName(item.name.view()))
-            byName_.emplace(std::u16string(item.name.view()), last);
+        const std::u16string_view name = item.name.view();
+        const std::u16string_view ns = item.nameNs.view();
+        byQName_.insertFirst(qhash(name, ns), last, [&](size_t at) {
+            return items_[at].name.view() == name && items_[at].nameNs.view() == ns;
+        });
+        if (isAnonName(name))
+            byName_.insertFirst(nhash(name), last,
+                                [&](size_t at) { return items_[at].name.view() == name; });
     }
 
     std::deque<T> items_;
-    Index byQName_; // (namespace, name) -> first position
-    Index byName_;  // names beginning with "anon" -> first position
+    PositionIndex byQName_; // (name, namespace) -> first position
+    PositionIndex byName_;  // names beginning with "anon" -> first position
 };

@@ -50,17 +50,14 @@ BATCHERR ZrXmlSchemaDict::ReadDictionary(const char* path) {
     ZrWString widePath;
     // No exception may reach the host. The browser catches everything around the
     // parser itself; what is left is running out of memory while building or
-    // copying records, which fails the read like any other cause.
+    // handing over records, which fails the read like any other cause.
     try {
         widePath.Assign(path, ZR_CSET_DEFAULT, -1);
         ZrXmlSchemaBrowser browser;
         if (!browser.ReadSchema(widePath.c_str(), qualifiedRecords))
             return BE_READ_FAILED;
-        const ZrRecordList& built = browser.Records();
-        for (int i = 0; i < built.Count(); ++i) {
-            if (!RecordList().AddRecord(built[i], -1))
-                throw std::bad_alloc();
-        }
+        // The browser goes away with this scope: its records move rather than copy.
+        browser.TakeRecords(RecordList());
     } catch (const std::bad_alloc&) {
         RecordList().Clear();
         ZrGlob::LogMessage(ZR_SEV_ERROR, BE_NO_MEMORY,

@@ -63,14 +63,25 @@ void ZrXmlSchemaBrowser::startElement(const XMLCh* name, xercesc::AttributeList&
         FirstElementAttrs(attrs);
         firstElement = false;
     }
-    ZrXmlUtils::XMLChToWchar(name, nameBuffer, false);
-    parseName(nameBuffer.c_str(), true, tagLocal, tagNamespace);
-    if (tagLocal.view() == u"schema")
-        schemaNamespace = tagNamespace;
-    if (tagNamespace != schemaNamespace)
+    // The tag's name resolved as parseName would, but its namespace is only compared,
+    // not kept: copying it for every tag costs more than the comparison.
+    std::u16string_view local = name ? std::u16string_view(name) : std::u16string_view();
+    const ZrWString* uri = &defaultNamespace;
+    const size_t colon = local.find(u':');
+    if (colon != std::u16string_view::npos) {
+        uri = namespaceOfPrefix(local.substr(0, colon));
+        local.remove_prefix(colon + 1);
+    }
+    tagLocal = local;
+    const std::u16string_view ns = uri ? uri->view() : std::u16string_view();
+    if (local == u"schema")
+        schemaNamespace = ns;
+    if (ns != schemaNamespace.view()) {
+        tagNamespace = ns;
         ZrGlob::LogMessage(ZR_SEV_NOTICE, 0,
                            "Element '%S' not in XMLSchema namespace (is '%S', should be '%S'",
                            tagLocal.c_str(), tagNamespace.c_str(), schemaNamespace.c_str());
+    }
 
     for (const StartAction& entry : kStartTable) {
         if (entry.name == tagLocal.view()) {
@@ -104,10 +115,13 @@ void ZrXmlSchemaBrowser::endElement(const XMLCh* name) {
         --skipDepth;
         return;
     }
-    ZrXmlUtils::XMLChToWchar(name, nameBuffer, false);
-    parseName(nameBuffer.c_str(), true, tagLocal, tagNamespace);
+    // Only the local part chooses the action; the end tag's namespace plays no part.
+    std::u16string_view local = name ? std::u16string_view(name) : std::u16string_view();
+    const size_t colon = local.find(u':');
+    if (colon != std::u16string_view::npos)
+        local.remove_prefix(colon + 1);
     for (const EndAction& entry : kEndTable) {
-        if (entry.name == tagLocal.view()) {
+        if (entry.name == local) {
             (this->*entry.act)();
             return;
         }

@@ -14,6 +14,7 @@ constexpr XMLCh kTargetPrefix[] = u"zrxxxtrg";
 // Only the first element of each document declares namespaces; its declarations
 // apply to its own name too, so they are read before that name is resolved.
 void ZrXmlSchemaBrowser::FirstElementAttrs(xercesc::AttributeList& attrs) {
+    prefixOfUriStale = true;
     for (XMLSize_t i = 0; i < attrs.getLength(); ++i) {
         ZrXmlUtils::XMLChToWchar(attrs.getName(i), nameBuffer, false);
         ZrXmlUtils::XMLChToWchar(attrs.getValue(i), valueBuffer, false);
@@ -48,24 +49,35 @@ void ZrXmlSchemaBrowser::parseName(const XMLCh* name, bool useDefault, ZrWString
         text = aliased.view();
     }
 
-    const XMLCh* uri = useDefault ? defaultNamespace.c_str() : targetNamespace.c_str();
+    const ZrWString* uri = useDefault ? &defaultNamespace : &targetNamespace;
     const size_t colon = text.find(u':');
     if (colon != std::u16string_view::npos) {
-        const std::u16string prefix(text.substr(0, colon));
-        uri = LookupNamespace(prefix.c_str());
+        uri = namespaceOfPrefix(text.substr(0, colon));
         text.remove_prefix(colon + 1);
     }
-    // An unknown prefix leaves no namespace: the empty text.
-    ns = uri ? uri : u"";
+    // An unknown prefix leaves no namespace: the empty text. Assigning views reuses
+    // whatever storage the outputs already have.
+    if (uri)
+        ns = uri->view();
+    else
+        ns.clear();
     localPart = text;
 }
 
 const XMLCh* ZrXmlSchemaBrowser::LookupNamespace(const XMLCh* prefix) {
-    const std::u16string_view key = prefix ? std::u16string_view(prefix) : std::u16string_view();
-    if (key == std::u16string_view(kTargetPrefix))
-        return targetNamespace.c_str();
-    const auto it = namespacePrefixes.find(ZrWString(key));
-    return it == namespacePrefixes.end() ? nullptr : it->second.c_str();
+    const ZrWString* uri =
+        namespaceOfPrefix(prefix ? std::u16string_view(prefix) : std::u16string_view());
+    return uri ? uri->c_str() : nullptr;
+}
+
+// Runs for nearly every tag and qualified attribute value: the key goes through a
+// buffer that keeps its storage rather than a new string per lookup.
+const ZrWString* ZrXmlSchemaBrowser::namespaceOfPrefix(std::u16string_view prefix) {
+    if (prefix == std::u16string_view(kTargetPrefix))
+        return &targetNamespace;
+    prefixKey = prefix;
+    const auto it = namespacePrefixes.find(prefixKey);
+    return it == namespacePrefixes.end() ? nullptr : &it->second;
 }
 
 const XMLCh* ZrXmlSchemaBrowser::ReverseNamespace(const XMLCh* uri, bool useTargetPrefix) {
@@ -74,9 +86,16 @@ const XMLCh* ZrXmlSchemaBrowser::ReverseNamespace(const XMLCh* uri, bool useTarg
         return kTargetPrefix;
     if (defaultNamespace == text || targetNamespace == text)
         return u"";
-    for (const auto& [prefix, bound] : namespacePrefixes) {
-        if (bound == text)
-            return prefix.c_str();
+    // The table changes only here (FirstElementAttrs) and when a read empties it;
+    // the size check also covers a table filled by other means.
+    if (prefixOfUriStale || prefixOfUriSize != namespacePrefixes.size()) {
+        prefixOfUri.clear();
+        for (const auto& [prefix, bound] : namespacePrefixes)
+            prefixOfUri.emplace(bound, prefix); // keeps the first in table order
+        prefixOfUriSize = namespacePrefixes.size();
+        prefixOfUriStale = false;
     }
-    return u"";
+    prefixKey = text;
+    const auto it = prefixOfUri.find(prefixKey);
+    return it == prefixOfUri.end() ? u"" : it->second.c_str();
 }

@@ -1,13 +1,12 @@
 #include "ParserConfig.h"
 
-#include <xercesc/sax/HandlerBase.hpp>
-#include <xercesc/util/PlatformUtils.hpp>
-#include <xercesc/util/SecurityManager.hpp>
-#include <xercesc/sax/SAXException.hpp>
-#include <xercesc/validators/DTD/DTDEntityDecl.hpp>
-
 #include <string>
 #include <string_view>
+#include <xercesc/sax/HandlerBase.hpp>
+#include <xercesc/sax/SAXException.hpp>
+#include <xercesc/util/PlatformUtils.hpp>
+#include <xercesc/util/SecurityManager.hpp>
+#include <xercesc/validators/DTD/DTDEntityDecl.hpp>
 
 namespace {
 
@@ -51,8 +50,8 @@ void SchemaParser::entityDecl(const xercesc::DTDEntityDecl& decl, bool isPEDecl,
         const XMLCh* name = decl.getName();
         throw SchemaEntityTooLong{name ? name : u"", decl.getValueLen()};
     }
-    if (isPEDecl && decl.getValue() && std::u16string_view(decl.getValue()).find(u'%') !=
-                                           std::u16string_view::npos) {
+    const XMLCh* value = decl.getValue();
+    if (isPEDecl && value && std::u16string_view(value).find(u'%') != std::u16string_view::npos) {
         const XMLCh* name = decl.getName();
         const std::u16string message = u"parameter entity '" + std::u16string(name ? name : u"") +
                                        u"' refers to other parameter entities";

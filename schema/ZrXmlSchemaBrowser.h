@@ -19,9 +19,11 @@
 #include <deque>
 #include <map>
 #include <memory>
+#include <string_view>
 #include <type_traits>
 #include <unordered_map>
 #include <unordered_set>
+#include <utility>
 #include <vector>
 
 static_assert(std::is_same_v<XMLCh, char16_t>, "the host's wide text must be the parser's XMLCh");
@@ -50,6 +52,12 @@ public:
     bool ReadSchema(const ZrWChar* path, bool qualified);
     // Records of the latest read, in building order; they live as long as the browser.
     const ZrRecordList& Records() const { return records; }
+    // Moves the records of the latest read to the end of `target`; the browser keeps
+    // none. Throws bad_alloc, nothing moved, when memory runs out.
+    void TakeRecords(ZrRecordList& target) {
+        target.TakeAll(records);
+        recordsByName.clear();
+    }
 
     // First built-in type whose alias equals `name` (compared as UTF-8 bytes), or null.
     const ZrDType* TypeByName(const XMLCh* name) const;
@@ -73,6 +81,8 @@ private:
     void FirstElementAttrs(xercesc::AttributeList& attrs);
     void parseName(const XMLCh* name, bool useDefault, ZrWString& localPart, ZrWString& ns);
     const XMLCh* LookupNamespace(const XMLCh* prefix);
+    // The namespace bound to `prefix`, or null when none is.
+    const ZrWString* namespaceOfPrefix(std::u16string_view prefix);
     const XMLCh* ReverseNamespace(const XMLCh* uri, bool useTargetPrefix);
 
     // Handlers of schema constructs.
@@ -137,6 +147,8 @@ private:
     bool nestingTooDeep(const ZrWString& where);
     bool takeBuildStep(const ZrWString& where);
     long buildStepBudget() const;
+    bool recordHasField(const ZrRecord* record, const ZrWString& name) const;
+    void noteField(const ZrRecord* record, const ZrWString& name);
 
     // Field typing.
     bool lookupType(const XMLCh* localName, const XMLCh* namespaceURI, ZrDType& type);
@@ -184,11 +196,26 @@ private:
     ZrWString defaultNamespace;
     ZrWString targetNamespace;
     std::map<ZrWString, ZrWString> namespacePrefixes;
+    // Scratch key of prefix lookups.
+    ZrWString prefixKey;
+    // ReverseNamespace's scan of namespacePrefixes kept as an index: for each URI the
+    // first prefix in table order bound to it. Rebuilt before use when the table may
+    // have changed, so a schema binding thousands of prefixes does not cost a scan per
+    // name it writes back.
+    std::unordered_map<ZrWString, ZrWString> prefixOfUri;
+    bool prefixOfUriStale = true;
+    size_t prefixOfUriSize = 0;
     ZrWString schemaNamespace;
 
     // Scratch text of the current tag and attribute.
     ZrWString nameBuffer;
     ZrWString valueBuffer;
+
+    // Scratch text of addSimpleField: the field's type name as text, and the local
+    // part and namespace read back from it.
+    ZrWString fieldTypeText;
+    ZrWString fieldTypeLocal;
+    ZrWString fieldTypeNs;
 
     // Qualified names of the records under construction, outermost first.
     std::vector<ZrWString> recordWorkList;
@@ -222,6 +249,10 @@ private:
     // addField and buildRecord calls of the current read, and their ceiling.
     long buildSteps = 0;
     long buildStepLimit = 0;
+    // The names of the fields given so far to each record under construction,
+    // innermost last: whether a record already has a field of some name is then a
+    // lookup, not a scan of a record that may hold many thousands of fields.
+    std::vector<std::pair<const ZrRecord*, std::unordered_set<ZrWString>>> fieldNamesOfOpenRecords;
 };
 
 // Parser input over the host file proxy.
