@@ -1,0 +1,54 @@
+// Fuzz target: a schema spread over three documents that may include each other.
+//
+// The input holds up to three documents separated by the line "--8<--"; they are
+// written as a.xsd, b.xsd and c.xsd in one folder (missing ones are empty) and a.xsd
+// is read as the main document, so any of them can include any other, itself, or a
+// file that does not exist. The read must end, with the same promises as a single
+// document: records and status 0, or no records, status 19 and a logged error.
+#include "FuzzSupport.h"
+#include "ZrXmlSchemaDict.h"
+
+#include <cstddef>
+#include <cstdint>
+#include <string_view>
+
+namespace {
+
+constexpr std::string_view kSeparator = "\n--8<--\n";
+
+} // namespace
+
+extern "C" int LLVMFuzzerTestOneInput(const uint8_t* data, size_t size) {
+    std::string_view rest(reinterpret_cast<const char*>(data), size);
+    std::string_view docs[3];
+    int count = 0;
+    while (count < 2) {
+        const size_t cut = rest.find(kSeparator);
+        if (cut == std::string_view::npos)
+            break;
+        docs[count++] = rest.substr(0, cut);
+        rest.remove_prefix(cut + kSeparator.size());
+    }
+    // Whatever follows the last separator is the next document; the rest stay empty.
+    docs[count] = rest;
+
+    auto& scratch = zrfuzz::ScratchDir::instance();
+    scratch.clean();
+    const std::string main = scratch.write("a.xsd", docs[0]);
+    scratch.write("b.xsd", docs[1]);
+    scratch.write("c.xsd", docs[2]);
+
+    zrfuzz::LogKeeper log;
+    ZrXmlSchemaDict dict(nullptr);
+    dict.QualifiedRecords(size % 2 == 1);
+    const BATCHERR status = dict.ReadDictionary(main.c_str());
+
+    ZRFUZZ_CHECK(status == BE_OK || status == BE_READ_FAILED);
+    if (status == BE_OK) {
+        ZRFUZZ_CHECK(!log.loggedError());
+    } else {
+        ZRFUZZ_CHECK(dict.RecordList().Count() == 0);
+        ZRFUZZ_CHECK(log.loggedError());
+    }
+    return 0;
+}
