@@ -12,8 +12,6 @@ namespace {
 
 std::string example() { return examplesDir() + "/purchase-order.xsd"; }
 
-std::string emptySchema() { return dataDir() + "/e2e/empty-schema.xsd"; }
-
 bool contains(const std::string& text, const std::string& part) {
     return text.find(part) != std::string::npos;
 }
@@ -165,32 +163,6 @@ TEST(Read, MissingFileReportsTheParserMessage) {
     EXPECT_TRUE(contains(text, "/nonexistent/missing.xsd")) << text;
 }
 
-TEST(Read, SchemaWithoutDeclarationsHasNoRecords) {
-    RunResult run = runZrdict({"read", "--format", "json", emptySchema()});
-    EXPECT_EQ(run.exitStatus, 0);
-    Json expected = Json::parse(R"({"status": 0, "records": [], "messages": []})");
-    EXPECT_EQ(run.json(), expected);
-}
-
-TEST(Read, JsonShapeOfRecordsAndFields) {
-    RunResult run = runZrdict({"read", "--format", "json", example()});
-    ASSERT_EQ(run.exitStatus, 0) << run.out << run.err;
-    Json doc = run.json();
-    EXPECT_EQ(keysOf(doc), (std::vector<std::string>{"status", "records", "messages"}));
-    ASSERT_FALSE(doc["records"].empty());
-    const Json& record = doc["records"][0];
-    EXPECT_EQ(record["name"], "purchaseOrder");
-    EXPECT_EQ(keysOf(record), (std::vector<std::string>{"name", "length", "fields"}));
-    ASSERT_FALSE(record["fields"].empty());
-    const Json& field = record["fields"][0];
-    EXPECT_EQ(keysOf(field), (std::vector<std::string>{"name", "alias", "description", "type"}));
-    std::vector<std::string> keys = keysOf(field["type"]);
-    ASSERT_GE(keys.size(), 7u);
-    keys.resize(7);
-    EXPECT_EQ(keys, (std::vector<std::string>{"class", "alias", "usage", "length", "precision",
-                                              "decimals", "nulls"}));
-}
-
 TEST(Read, TextOutputIsATablePerRecord) {
     RunResult run = runZrdict({"read", example()});
     ASSERT_EQ(run.exitStatus, 0) << run.err;
@@ -242,15 +214,6 @@ TEST(Options, AreAppliedInOrder) {
         ASSERT_EQ(run.exitStatus, 0) << run.out;
         EXPECT_EQ(run.json()["options"][0]["value"], row.value);
     }
-}
-
-TEST(Options, ReachTheRead) {
-    RunResult plain = runZrdict({"read", "--format", "json", example()});
-    RunResult qualified =
-        runZrdict({"read", "--option", "QualifiedRecordNames=True", "--format", "json", example()});
-    ASSERT_EQ(plain.exitStatus, 0);
-    ASSERT_EQ(qualified.exitStatus, 0);
-    EXPECT_NE(plain.json()["records"], qualified.json()["records"]);
 }
 
 TEST(Types, JsonListsTheBuiltinTable) {

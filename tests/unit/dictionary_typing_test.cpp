@@ -3,8 +3,10 @@
 
 #include <cstdint>
 #include <gtest/gtest.h>
+#include <map>
 #include <memory>
 #include <random>
+#include <sstream>
 #include <string>
 
 namespace {
@@ -228,38 +230,34 @@ TEST_P(Limits, Digits) {
 INSTANTIATE_TEST_SUITE_P(Dictionary, Limits, ::testing::ValuesIn(kLimits),
                          [](const auto& row) { return std::string(row.param.label); });
 
-// Simple types placed in the model by hand, resolved by lookupType.
-struct Facets {
-    const char* name;
-    const char* base;
-    const char* length = "";
-    const char* maxLength = "";
-    const char* scale = "";
-    const char* precision = "";
-    const char* minInclusive = "";
-    const char* maxInclusive = "";
-    const char* pattern = "";
-    int32_t maxEnumLength = 0;
-};
-
-SimpleTypeDef simpleType(const Facets& f) {
+// Simple types placed in the model by hand, resolved by lookupType. A type is
+// written "name base facet=value ...", enum= giving the longest enumeration.
+SimpleTypeDef simpleType(const std::string& spec) {
+    std::istringstream in(spec);
+    std::string name, base, facet;
+    in >> name >> base;
     SimpleTypeDef type;
-    type.name = wide(f.name);
-    type.baseName = wide(f.base);
-    type.length = wide(f.length);
-    type.maxLength = wide(f.maxLength);
-    type.scale = wide(f.scale);
-    type.precision = wide(f.precision);
-    type.minInclusive = wide(f.minInclusive);
-    type.maxInclusive = wide(f.maxInclusive);
-    type.pattern = wide(f.pattern);
-    type.maxEnumLength = f.maxEnumLength;
+    type.name = wide(name);
+    type.baseName = wide(base);
+    const std::map<std::string, ZrWString SimpleTypeDef::*> members = {
+        {"length", &SimpleTypeDef::length},    {"maxLength", &SimpleTypeDef::maxLength},
+        {"scale", &SimpleTypeDef::scale},      {"precision", &SimpleTypeDef::precision},
+        {"min", &SimpleTypeDef::minInclusive}, {"max", &SimpleTypeDef::maxInclusive},
+        {"pattern", &SimpleTypeDef::pattern}};
+    while (in >> facet) {
+        const size_t eq = facet.find('=');
+        const std::string key = facet.substr(0, eq), value = facet.substr(eq + 1);
+        if (key == "enum")
+            type.maxEnumLength = std::stoi(value);
+        else
+            type.*members.at(key) = wide(value);
+    }
     return type;
 }
 
 struct ResolveCase {
     const char* label;
-    Facets facets;
+    const char* type; // named t
     const char* alias;
     long length;
     long precision;
@@ -269,34 +267,19 @@ struct ResolveCase {
 void PrintTo(const ResolveCase& row, std::ostream* os) { *os << row.label; }
 
 const ResolveCase kResolves[] = {
-    {"MaxLength", {"t", "string", "", "20"}, "string", 20, 0, 0},
-    {"LengthBeatsMaxLength", {"t", "string", "10", "20"}, "string", 10, 0, 0},
-    {"EnumerationBeatsLengths",
-     {"t", "string", "10", "20", "", "", "", "", "", 7},
-     "string",
-     7,
-     0,
-     0},
-    {"LimitsOnInt", {"t", "int", "", "", "", "", "0", "999"}, "int", 3, 3, 0},
-    {"LimitsBeatPrecisionFacet", {"t", "int", "", "", "", "5", "0", "999"}, "int", 3, 3, 0},
-    {"PatternBeatsLimits", {"t", "int", "", "", "", "", "0", "999", R"(\d{6})"}, "int", 3, 6, 0},
-    {"PatternBeatsPrecisionFacet",
-     {"t", "int", "", "", "", "9", "", "", "[0-9]{4}"},
-     "int",
-     0,
-     4,
-     0},
-    {"EnumerationBeatsLimits", {"t", "int", "", "", "", "", "0", "999", "", 5}, "int", 5, 3, 0},
-    {"DecimalKeepsPrecisionOverLimits",
-     {"t", "decimal", "", "", "", "", "0", "999"},
-     "decimal",
-     0,
-     16,
-     2},
-    {"PrecisionAndScale", {"t", "decimal", "", "", "3", "8"}, "decimal", 0, 8, 3},
-    {"ScaleClampedToShort", {"t", "decimal", "", "", "99999"}, "decimal", 0, 16, 32767},
-    {"AnyTypeBaseIsString", {"t", "anyType", "", "12"}, "string", 12, 0, 0},
-    {"UnusablePatternLeavesPrecision", {"t", "int", "", "", "", "", "", "", "a+"}, "int", 0, 10, 0},
+    {"MaxLength", "t string maxLength=20", "string", 20, 0, 0},
+    {"LengthBeatsMaxLength", "t string length=10 maxLength=20", "string", 10, 0, 0},
+    {"EnumerationBeatsLengths", "t string length=10 maxLength=20 enum=7", "string", 7, 0, 0},
+    {"LimitsOnInt", "t int min=0 max=999", "int", 3, 3, 0},
+    {"LimitsBeatPrecisionFacet", "t int precision=5 min=0 max=999", "int", 3, 3, 0},
+    {"PatternBeatsLimits", R"(t int min=0 max=999 pattern=\d{6})", "int", 3, 6, 0},
+    {"PatternBeatsPrecisionFacet", "t int precision=9 pattern=[0-9]{4}", "int", 0, 4, 0},
+    {"EnumerationBeatsLimits", "t int min=0 max=999 enum=5", "int", 5, 3, 0},
+    {"DecimalKeepsPrecisionOverLimits", "t decimal min=0 max=999", "decimal", 0, 16, 2},
+    {"PrecisionAndScale", "t decimal scale=3 precision=8", "decimal", 0, 8, 3},
+    {"ScaleClampedToShort", "t decimal scale=99999", "decimal", 0, 16, 32767},
+    {"AnyTypeBaseIsString", "t anyType maxLength=12", "string", 12, 0, 0},
+    {"UnusablePatternLeavesPrecision", "t int pattern=a+", "int", 0, 10, 0},
 };
 
 class Resolve : public ::testing::TestWithParam<ResolveCase> {};
@@ -305,7 +288,7 @@ TEST_P(Resolve, DerivesDataType) {
     const ResolveCase& c = GetParam();
     ZrXmlSchemaBrowser browser;
     ZrXmlSchemaBrowserTestAccess access(browser);
-    access.simpleTypes().push_back(simpleType(c.facets));
+    access.simpleTypes().push_back(simpleType(c.type));
     LogCapture log;
     ZrDType type;
     ASSERT_TRUE(access.lookupType(u"t", u"", type));
@@ -323,9 +306,8 @@ INSTANTIATE_TEST_SUITE_P(Dictionary, Resolve, ::testing::ValuesIn(kResolves),
 TEST(ResolveSimpleType, DerivedTypeStartsFromItsResolvedBase) {
     ZrXmlSchemaBrowser browser;
     ZrXmlSchemaBrowserTestAccess access(browser);
-    access.simpleTypes().push_back(simpleType({"code", "string", "", "5"}));
-    access.simpleTypes().push_back(
-        simpleType({"shortCode", "code", "", "", "", "", "", "", "[A-Z]{3}"}));
+    access.simpleTypes().push_back(simpleType("code string maxLength=5"));
+    access.simpleTypes().push_back(simpleType("shortCode code pattern=[A-Z]{3}"));
     ZrDType type;
     ASSERT_TRUE(access.lookupType(u"shortCode", u"", type));
     EXPECT_STREQ(type.Alias(), "string");
@@ -337,7 +319,7 @@ TEST(ResolveSimpleType, DerivedTypeStartsFromItsResolvedBase) {
 TEST(ResolveSimpleType, ResolvesOncePerType) {
     ZrXmlSchemaBrowser browser;
     ZrXmlSchemaBrowserTestAccess access(browser);
-    access.simpleTypes().push_back(simpleType({"t", "string", "", "20"}));
+    access.simpleTypes().push_back(simpleType("t string maxLength=20"));
     ZrDType first;
     ASSERT_TRUE(access.lookupType(u"t", u"", first));
     // A later change of the facets is not seen: the first derivation is reused.
@@ -350,10 +332,10 @@ TEST(ResolveSimpleType, ResolvesOncePerType) {
 TEST(ResolveSimpleType, NamespaceMustMatchUnlessGenerated) {
     ZrXmlSchemaBrowser browser;
     ZrXmlSchemaBrowserTestAccess access(browser);
-    SimpleTypeDef named = simpleType({"t", "string", "", "20"});
+    SimpleTypeDef named = simpleType("t string maxLength=20");
     named.nameNs = u"urn:a";
     access.simpleTypes().push_back(named);
-    access.simpleTypes().push_back(simpleType({"anon3", "string", "", "30"}));
+    access.simpleTypes().push_back(simpleType("anon3 string maxLength=30"));
     ZrDType type;
     EXPECT_FALSE(access.lookupType(u"t", u"urn:b", type));
     ASSERT_TRUE(access.lookupType(u"t", u"urn:a", type));
@@ -367,7 +349,7 @@ TEST(ResolveSimpleType, NamespaceMustMatchUnlessGenerated) {
 
 struct FailureCase {
     const char* label;
-    std::vector<Facets> types;
+    std::vector<const char*> types;
     const char* sought;
     const char* messages;
 };
@@ -376,21 +358,21 @@ void PrintTo(const FailureCase& row, std::ostream* os) { *os << row.label; }
 
 const FailureCase kFailures[] = {
     {"UnknownName", {}, "nothing", ""},
-    {"MissingBase", {{"t", "nothing"}}, "t", "4 0 Error resolving simple type t\n"},
-    {"EmptyBase", {{"t", ""}}, "t", "4 0 Error resolving simple type t\n"},
+    {"MissingBase", {"t nothing"}, "t", "4 0 Error resolving simple type t\n"},
+    {"EmptyBase", {"t"}, "t", "4 0 Error resolving simple type t\n"},
     {"MissingBaseTwoLevelsDown",
-     {{"a", "b"}, {"b", "nothing"}},
+     {"a b", "b nothing"},
      "a",
      "4 0 Error resolving simple type b\n"
      "4 0 Error resolving simple type a\n"},
     {"SelfBase",
-     {{"a", "a"}},
+     {"a a"},
      "a",
      "4 0 Circular base type chain at simple type a\n"
      "4 0 Error resolving simple type a\n"
      "4 0 Error resolving simple type a\n"},
     {"CycleBelowTheTypeSought",
-     {{"top", "a"}, {"a", "b"}, {"b", "a"}},
+     {"top a", "a b", "b a"},
      "top",
      "4 0 Circular base type chain at simple type a\n"
      "4 0 Error resolving simple type a\n"
@@ -405,7 +387,7 @@ TEST_P(ResolveFailure, FailsAndLeavesTypeUnresolved) {
     const FailureCase& c = GetParam();
     ZrXmlSchemaBrowser browser;
     ZrXmlSchemaBrowserTestAccess access(browser);
-    for (const Facets& f : c.types)
+    for (const char* f : c.types)
         access.simpleTypes().push_back(simpleType(f));
     LogCapture log;
     ZrDType type;
@@ -426,7 +408,7 @@ TEST(ResolveSimpleType, ComplexTypeIsRefused) {
     ComplexTypeDef complex;
     complex.name = u"c";
     access.complexTypes().push_back(complex);
-    access.simpleTypes().push_back(simpleType({"t", "c"}));
+    access.simpleTypes().push_back(simpleType("t c"));
     LogCapture log;
     ZrDType type;
     EXPECT_FALSE(access.lookupType(u"c", u"", type));
@@ -444,8 +426,7 @@ TEST(ResolveSimpleType, LongBaseChainsAreBounded) {
         ZrXmlSchemaBrowserTestAccess access(browser);
         for (int i = 0; i < length; ++i) {
             const std::string base = i + 1 < length ? "t" + std::to_string(i + 1) : "string";
-            access.simpleTypes().push_back(
-                simpleType({("t" + std::to_string(i)).c_str(), base.c_str()}));
+            access.simpleTypes().push_back(simpleType("t" + std::to_string(i) + " " + base));
         }
         LogCapture log;
         ZrDType type;
