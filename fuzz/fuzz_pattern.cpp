@@ -55,8 +55,8 @@ extern "C" int LLVMFuzzerTestOneInput(const uint8_t* data, size_t size) {
     ZRFUZZ_CHECK(cursor >= begin && cursor <= end);
 
     cursor = begin;
-    const long spec = access.lengthSpec(cursor);
-    ZRFUZZ_CHECK(spec >= -1);
+    const long bound = access.lengthSpec(cursor);
+    ZRFUZZ_CHECK(bound >= -1);
     ZRFUZZ_CHECK(cursor >= begin && cursor <= end);
     return 0;
 }
