@@ -232,8 +232,8 @@ INSTANTIATE_TEST_SUITE_P(Dictionary, Limits, ::testing::ValuesIn(kLimits),
 
 // Simple types placed in the model by hand, resolved by lookupType. A type is
 // written "name base facet=value ...", enum= giving the longest enumeration.
-SimpleTypeDef simpleType(const std::string& spec) {
-    std::istringstream in(spec);
+SimpleTypeDef simpleType(const std::string& text) {
+    std::istringstream in(text);
     std::string name, base, facet;
     in >> name >> base;
     SimpleTypeDef type;
