@@ -3,6 +3,7 @@
 // the run loudly when a property of the reader does not hold.
 #pragma once
 
+#include "ZrXmlSchemaDict.h"
 #include "zrglob.h"
 #include "zrstring.h"
 
@@ -125,5 +126,23 @@ class LogKeeper {
   private:
     ZrLogSink previous_;
 };
+
+// Reads the schema at `path` the way a host does and checks what a read promises
+// whatever its input: records and status 0 without a logged error, or no records,
+// status 19 and a logged error that says why.
+inline void readAndCheck(const std::string& path, bool qualifiedRecords) {
+    LogKeeper log;
+    ZrXmlSchemaDict dict(nullptr);
+    dict.QualifiedRecords(qualifiedRecords);
+    const BATCHERR status = dict.ReadDictionary(path.c_str());
+
+    ZRFUZZ_CHECK(status == BE_OK || status == BE_READ_FAILED);
+    if (status == BE_OK) {
+        ZRFUZZ_CHECK(!log.loggedError());
+    } else {
+        ZRFUZZ_CHECK(dict.RecordList().Count() == 0);
+        ZRFUZZ_CHECK(log.loggedError());
+    }
+}
 
 } // namespace zrfuzz
