@@ -46,7 +46,7 @@ int64_t facetNumber(const XMLCh* text) {
     return std::clamp<int64_t>(value, INT32_MIN, INT32_MAX);
 }
 
-int64_t facetNumber(const ZrWString& text) { return facetNumber(text.c_str()); }
+int64_t facetNumber(const ZrName& text) { return facetNumber(text.c_str()); }
 
 bool isEmpty(const XMLCh* text) { return !text || !*text; }
 
@@ -121,7 +121,7 @@ bool ZrXmlSchemaBrowser::resolveSimpleType(SimpleTypeDef& simpleType) {
     }
     ++buildDepth;
     bool based = false;
-    if (!nestingTooDeep(simpleType.name)) {
+    if (!nestingTooDeep(simpleType.name.c_str())) {
         resolvingTypes.insert(&simpleType);
         based =
             lookupType(simpleType.baseName.c_str(), simpleType.baseNs.c_str(), simpleType.dataType);

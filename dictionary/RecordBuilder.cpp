@@ -90,7 +90,7 @@ ZrRecord* ZrXmlSchemaBrowser::buildRecord(const ElementDef& declaration) {
     }
     const ZrWString qualified = qualifiedName(declaration.nameNs, declaration.name, false);
     DepthScope depth(buildDepth);
-    if (nestingTooDeep(qualified) || !takeBuildStep(qualified))
+    if (nestingTooDeep(qualified.c_str()) || !takeBuildStep(qualified.c_str()))
         return nullptr;
 
     ZrWString name = recordName(qualified);
@@ -167,7 +167,7 @@ bool ZrXmlSchemaBrowser::addDerivedContent(const ComplexTypeDef& type, const ZrW
         return false;
     }
     DepthScope depth(buildDepth);
-    if (nestingTooDeep(base->name))
+    if (nestingTooDeep(base->name.c_str()))
         return false;
     ExpansionScope expanding(expansionStack, base);
     bool added = addDerivedContent(*base, recordName, record);
@@ -184,15 +184,15 @@ bool ZrXmlSchemaBrowser::addSimpleContentField(const ComplexTypeDef& type,
     SimpleTypeDef text(static_cast<const SimpleTypeDef&>(type));
     text.name = generatedName(anonCounter++);
     simpleTypes.push_back(std::move(text));
-    const ZrWString typeName = simpleTypes.back().name;
-    if (!addTextField(recordName, typeName, ZrWString(), record))
+    const ZrName typeName = simpleTypes.back().name;
+    if (!addTextField(recordName, typeName, ZrName(), record))
         return false; // the temporary type stays; the read fails anyway
     simpleTypes.pop_back();
     return true;
 }
 
-bool ZrXmlSchemaBrowser::addTextField(const ZrWString& recordName, const ZrWString& typeName,
-                                      const ZrWString& typeNs, ZrRecord* record) {
+bool ZrXmlSchemaBrowser::addTextField(const ZrWString& recordName, const ZrName& typeName,
+                                      const ZrName& typeNs, ZrRecord* record) {
     ElementDef text;
     text.name = recordName;
     text.typeName = typeName;
@@ -201,7 +201,7 @@ bool ZrXmlSchemaBrowser::addTextField(const ZrWString& recordName, const ZrWStri
 }
 
 bool ZrXmlSchemaBrowser::addField(const ElementDef& declaration, ZrRecord* record) {
-    if (!takeBuildStep(record->name))
+    if (!takeBuildStep(record->name.c_str()))
         return false;
     if (!declaration.refName.empty())
         return addReference(declaration, record);
@@ -239,7 +239,7 @@ bool ZrXmlSchemaBrowser::addReference(const ElementDef& reference, ZrRecord* rec
         return false;
     }
     DepthScope depth(buildDepth);
-    if (nestingTooDeep(reference.refName))
+    if (nestingTooDeep(reference.refName.c_str()))
         return false;
     ExpansionScope expanding(expansionStack, target);
     return addField(*target, record);
@@ -258,7 +258,7 @@ bool ZrXmlSchemaBrowser::addGroup(const ElementDef& reference, ZrRecord* record)
         return false;
     }
     DepthScope depth(buildDepth);
-    if (nestingTooDeep(reference.groupName))
+    if (nestingTooDeep(reference.groupName.c_str()))
         return false;
     ExpansionScope expanding(expansionStack, group);
     for (const ElementDef& entry : group->content) {
@@ -279,10 +279,10 @@ bool ZrXmlSchemaBrowser::addSimpleField(const ElementDef& declaration, ZrRecord*
         prefix && *prefix) {
         typeText = std::u16string_view(prefix);
         typeText += u':';
-        typeText += declaration.typeName;
+        typeText += declaration.typeName.view();
     }
-    ZrWString& local = fieldTypeLocal;
-    ZrWString& ns = fieldTypeNs;
+    ZrName& local = fieldTypeLocal;
+    ZrName& ns = fieldTypeNs;
     parseName(typeText.c_str(), true, local, ns);
     if (local.empty())
         local = u"string";
@@ -308,14 +308,14 @@ bool ZrXmlSchemaBrowser::addSimpleField(const ElementDef& declaration, ZrRecord*
     return true;
 }
 
-ZrWString ZrXmlSchemaBrowser::qualifiedName(const ZrWString& ns, const ZrWString& local,
+ZrWString ZrXmlSchemaBrowser::qualifiedName(const ZrName& ns, const ZrName& local,
                                             bool useTargetPrefix) {
     const XMLCh* prefix = ReverseNamespace(ns.c_str(), useTargetPrefix);
     if (!prefix || !*prefix)
-        return local;
+        return ZrWString(local.view());
     ZrWString name(prefix);
     name += u':';
-    name += local;
+    name += local.view();
     return name;
 }
 
@@ -347,15 +347,15 @@ bool ZrXmlSchemaBrowser::isExpanding(const void* component) const {
     return false;
 }
 
-bool ZrXmlSchemaBrowser::nestingTooDeep(const ZrWString& where) {
+bool ZrXmlSchemaBrowser::nestingTooDeep(const XMLCh* where) {
     if (buildDepth <= kMaxBuildDepth)
         return false;
     ZrGlob::LogMessage(ZR_SEV_ERROR, 0, "Schema nesting deeper than %d levels at %S",
-                       kMaxBuildDepth, where.c_str());
+                       kMaxBuildDepth, where);
     return true;
 }
 
-bool ZrXmlSchemaBrowser::takeBuildStep(const ZrWString& where) {
+bool ZrXmlSchemaBrowser::takeBuildStep(const XMLCh* where) {
     if (buildStepLimit == 0)
         buildStepLimit = buildStepBudget();
     if (++buildSteps <= buildStepLimit)
@@ -363,7 +363,7 @@ bool ZrXmlSchemaBrowser::takeBuildStep(const ZrWString& where) {
     // Said once: the failure unwinds the whole build without taking further steps.
     if (buildSteps == buildStepLimit + 1)
         ZrGlob::LogMessage(ZR_SEV_ERROR, 0, "Schema expands beyond %ld record-building steps at %S",
-                           buildStepLimit, where.c_str());
+                           buildStepLimit, where);
     return false;
 }
 

@@ -4,9 +4,12 @@
 namespace {
 
 // Gives a component without a name the next generated one.
-void nameIfAnonymous(ZrWString& name, int32_t& anonCounter) {
-    if (name.empty())
-        wsfmt(name, u"anon%d", anonCounter++);
+void nameIfAnonymous(ZrName& name, int32_t& anonCounter) {
+    if (!name.empty())
+        return;
+    ZrWString generated;
+    wsfmt(generated, u"anon%d", anonCounter++);
+    name = generated;
 }
 
 // Saves the working complex type on the stack and leaves it cleared. The fields
@@ -30,15 +33,15 @@ void ZrXmlSchemaBrowser::doComplexType(xercesc::AttributeList& attrs) {
     typeTarget = &currentComplexType;
 
     for (XMLSize_t i = 0; i < attrs.getLength(); ++i) {
-        ZrXmlUtils::XMLChToWchar(attrs.getName(i), nameBuffer, false);
-        ZrXmlUtils::XMLChToWchar(attrs.getValue(i), valueBuffer, false);
-        if (nameBuffer.startsWith(u"xmlns"))
+        const std::u16string_view attr = xmlText(attrs.getName(i));
+        const XMLCh* value = attrs.getValue(i);
+        if (attr.substr(0, 5) == u"xmlns")
             ZrGlob::LogMessage(ZR_SEV_NOTICE, 0, "xmlns in complextype attrs");
-        else if (nameBuffer.view() == u"name")
-            parseName(valueBuffer.c_str(), false, currentComplexType.name,
+        else if (attr == u"name")
+            parseName(value, false, currentComplexType.name,
                       currentComplexType.nameNs);
-        else if (nameBuffer.view() == u"base")
-            parseName(valueBuffer.c_str(), true, currentComplexType.baseName,
+        else if (attr == u"base")
+            parseName(value, true, currentComplexType.baseName,
                       currentComplexType.baseNs);
     }
     nameIfAnonymous(currentComplexType.name, anonCounter);
@@ -65,12 +68,12 @@ void ZrXmlSchemaBrowser::finishComplexType() {
 // The base always belongs to the working complex type, whatever typeTarget says.
 void ZrXmlSchemaBrowser::doExtension(xercesc::AttributeList& attrs) {
     for (XMLSize_t i = 0; i < attrs.getLength(); ++i) {
-        ZrXmlUtils::XMLChToWchar(attrs.getName(i), nameBuffer, false);
-        ZrXmlUtils::XMLChToWchar(attrs.getValue(i), valueBuffer, false);
-        if (nameBuffer.startsWith(u"xmlns"))
+        const std::u16string_view attr = xmlText(attrs.getName(i));
+        const XMLCh* value = attrs.getValue(i);
+        if (attr.substr(0, 5) == u"xmlns")
             ZrGlob::LogMessage(ZR_SEV_NOTICE, 0, "xmlns in extension attrs");
-        else if (nameBuffer.view() == u"base")
-            parseName(valueBuffer.c_str(), true, currentComplexType.baseName,
+        else if (attr == u"base")
+            parseName(value, true, currentComplexType.baseName,
                       currentComplexType.baseNs);
     }
 }
@@ -80,19 +83,19 @@ void ZrXmlSchemaBrowser::finishExtension() {}
 // "group" and "attributeGroup" alike: a reference becomes an entry of the
 // enclosing content (or a top-level entry); anything else opens a definition.
 void ZrXmlSchemaBrowser::doGroup(xercesc::AttributeList& attrs) {
-    ZrWString groupName;
-    ZrWString groupNs;
-    ZrWString refName;
-    ZrWString refNs;
+    ZrName groupName;
+    ZrName groupNs;
+    ZrName refName;
+    ZrName refNs;
     for (XMLSize_t i = 0; i < attrs.getLength(); ++i) {
-        ZrXmlUtils::XMLChToWchar(attrs.getName(i), nameBuffer, false);
-        ZrXmlUtils::XMLChToWchar(attrs.getValue(i), valueBuffer, false);
-        if (nameBuffer.startsWith(u"xmlns"))
+        const std::u16string_view attr = xmlText(attrs.getName(i));
+        const XMLCh* value = attrs.getValue(i);
+        if (attr.substr(0, 5) == u"xmlns")
             ZrGlob::LogMessage(ZR_SEV_NOTICE, 0, "xmlns in group attrs");
-        else if (nameBuffer.view() == u"name")
-            parseName(valueBuffer.c_str(), false, groupName, groupNs);
-        else if (nameBuffer.view() == u"ref")
-            parseName(valueBuffer.c_str(), false, refName, refNs);
+        else if (attr == u"name")
+            parseName(value, false, groupName, groupNs);
+        else if (attr == u"ref")
+            parseName(value, false, refName, refNs);
     }
     if (!groupName.empty() && !refName.empty()) {
         ZrGlob::LogMessage(ZR_SEV_NOTICE, 0, "Group %S has both name and ref", groupName.c_str());

@@ -12,18 +12,18 @@ void ZrXmlSchemaBrowser::doElement(xercesc::AttributeList& attrs, bool isAttribu
     currentElement.isAttribute = isAttribute;
 
     for (XMLSize_t i = 0; i < attrs.getLength(); ++i) {
-        ZrXmlUtils::XMLChToWchar(attrs.getName(i), nameBuffer, false);
-        ZrXmlUtils::XMLChToWchar(attrs.getValue(i), valueBuffer, false);
-        if (nameBuffer.startsWith(u"xmlns")) {
+        const std::u16string_view attr = xmlText(attrs.getName(i));
+        const XMLCh* value = attrs.getValue(i);
+        if (attr.substr(0, 5) == u"xmlns") {
             ZrGlob::LogMessage(ZR_SEV_NOTICE, 0, "xmlns in element attrs");
-        } else if (nameBuffer.view() == u"name") {
-            parseName(valueBuffer.c_str(), false, currentElement.name, currentElement.nameNs);
-        } else if (nameBuffer.view() == u"type") {
-            parseName(valueBuffer.c_str(), true, currentElement.typeName, currentElement.typeNs);
-        } else if (nameBuffer.view() == u"ref") {
-            parseName(valueBuffer.c_str(), false, currentElement.refName, currentElement.refNs);
-        } else if (nameBuffer.view() == u"nullable") {
-            currentElement.nullable = ZrGlob::wcscmpi(valueBuffer.c_str(), u"false") != 0;
+        } else if (attr == u"name") {
+            parseName(value, false, currentElement.name, currentElement.nameNs);
+        } else if (attr == u"type") {
+            parseName(value, true, currentElement.typeName, currentElement.typeNs);
+        } else if (attr == u"ref") {
+            parseName(value, false, currentElement.refName, currentElement.refNs);
+        } else if (attr == u"nullable") {
+            currentElement.nullable = ZrGlob::wcscmpi(value ? value : u"", u"false") != 0;
         }
     }
 }

@@ -3,6 +3,7 @@
 // namespace) pairs.
 #pragma once
 
+#include "ZrName.h"
 #include "zrdtype.h"
 #include "zrstring.h"
 
@@ -17,14 +18,14 @@
 // (element reference), else groupName set (group reference), else a declaration.
 class ElementDef {
 public:
-    ZrWString typeName;
-    ZrWString typeNs;
-    ZrWString name;
-    ZrWString nameNs;
-    ZrWString refName;
-    ZrWString refNs;
-    ZrWString groupName;
-    ZrWString groupNs;
+    ZrName typeName;
+    ZrName typeNs;
+    ZrName name;
+    ZrName nameNs;
+    ZrName refName;
+    ZrName refNs;
+    ZrName groupName;
+    ZrName groupNs;
     bool isAttribute = false;
     bool nullable = true;
 
@@ -38,25 +39,25 @@ class SimpleTypeDef {
 public:
     bool resolved = false;
     ZrDType dataType;
-    ZrWString name;
-    ZrWString nameNs;
-    ZrWString baseName;
-    ZrWString baseNs;
-    ZrWString minInclusive;
-    ZrWString maxInclusive;
-    ZrWString minExclusive;
-    ZrWString maxExclusive;
-    ZrWString length;
-    ZrWString minLength;
-    ZrWString maxLength;
-    ZrWString pattern;
-    ZrWString precision;
-    ZrWString scale;
-    ZrWString encoding;
-    ZrWString period;
-    ZrWString duration;
-    ZrWString facetAttrName;
-    ZrWString facetAttrValue;
+    ZrName name;
+    ZrName nameNs;
+    ZrName baseName;
+    ZrName baseNs;
+    ZrName minInclusive;
+    ZrName maxInclusive;
+    ZrName minExclusive;
+    ZrName maxExclusive;
+    ZrName length;
+    ZrName minLength;
+    ZrName maxLength;
+    ZrName pattern;
+    ZrName precision;
+    ZrName scale;
+    ZrName encoding;
+    ZrName period;
+    ZrName duration;
+    ZrName facetAttrName;
+    ZrName facetAttrValue;
     int32_t maxEnumLength = 0;
 
     SimpleTypeDef() = default;
@@ -141,7 +142,7 @@ public:
     T* find(std::u16string_view name, std::u16string_view ns) {
         if (isAnonName(name)) {
             const size_t pos = byName_.find(nhash(name), [&](size_t at) {
-                return items_[at].name.view() == name;
+                return zrSameText(items_[at].name.view(), name);
             });
             return pos == npos ? nullptr : &items_[pos];
         }
@@ -150,7 +151,8 @@ public:
     // First entry whose name and nameNs equal `name` and `ns`; null when none.
     T* findExact(std::u16string_view name, std::u16string_view ns) {
         const size_t pos = byQName_.find(qhash(name, ns), [&](size_t at) {
-            return items_[at].name.view() == name && items_[at].nameNs.view() == ns;
+            return zrSameText(items_[at].name.view(), name) &&
+                   zrSameText(items_[at].nameNs.view(), ns);
         });
         return pos == npos ? nullptr : &items_[pos];
     }
@@ -239,9 +241,7 @@ private:
         size_t count_ = 0;
     };
 
-    static size_t nhash(std::u16string_view name) {
-        return std::hash<std::u16string_view>()(name);
-    }
+    static size_t nhash(std::u16string_view name) { return size_t(zrTextHash(name)); }
     static size_t qhash(std::u16string_view name, std::u16string_view ns) {
         const size_t h = nhash(name);
         return h ^ (nhash(ns) + 0x9e3779b97f4a7c15ull + (h << 6) + (h >> 2));

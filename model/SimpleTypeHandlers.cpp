@@ -11,18 +11,21 @@ void ZrXmlSchemaBrowser::doSimpleType(xercesc::AttributeList& attrs) {
     typeTarget = &currentSimpleType;
 
     for (XMLSize_t i = 0; i < attrs.getLength(); ++i) {
-        ZrXmlUtils::XMLChToWchar(attrs.getName(i), nameBuffer, false);
-        ZrXmlUtils::XMLChToWchar(attrs.getValue(i), valueBuffer, false);
-        if (nameBuffer.startsWith(u"xmlns"))
+        const std::u16string_view attr = xmlText(attrs.getName(i));
+        const XMLCh* value = attrs.getValue(i);
+        if (attr.substr(0, 5) == u"xmlns")
             ZrGlob::LogMessage(ZR_SEV_NOTICE, 0, "xmlns in complextype attrs");
-        else if (nameBuffer.view() == u"name")
-            parseName(valueBuffer.c_str(), false, currentSimpleType.name, currentSimpleType.nameNs);
-        else if (nameBuffer.view() == u"base")
-            parseName(valueBuffer.c_str(), true, currentSimpleType.baseName,
+        else if (attr == u"name")
+            parseName(value, false, currentSimpleType.name, currentSimpleType.nameNs);
+        else if (attr == u"base")
+            parseName(value, true, currentSimpleType.baseName,
                       currentSimpleType.baseNs);
     }
-    if (currentSimpleType.name.empty())
-        wsfmt(currentSimpleType.name, u"anon%d", anonCounter++);
+    if (currentSimpleType.name.empty()) {
+        ZrWString generated;
+        wsfmt(generated, u"anon%d", anonCounter++);
+        currentSimpleType.name = generated;
+    }
 
     if (currentElement.typeName.empty()) {
         currentElement.typeName = currentSimpleType.name;
@@ -41,11 +44,9 @@ void ZrXmlSchemaBrowser::finishSimpleType() {
 // restrict: the base is dropped.
 void ZrXmlSchemaBrowser::doRestriction(xercesc::AttributeList& attrs) {
     for (XMLSize_t i = 0; i < attrs.getLength(); ++i) {
-        ZrXmlUtils::XMLChToWchar(attrs.getName(i), nameBuffer, false);
-        if (nameBuffer.view() != u"base" || !typeTarget)
+        if (xmlText(attrs.getName(i)) != u"base" || !typeTarget)
             continue;
-        ZrXmlUtils::XMLChToWchar(attrs.getValue(i), valueBuffer, false);
-        parseName(valueBuffer.c_str(), true, typeTarget->baseName, typeTarget->baseNs);
+        parseName(attrs.getValue(i), true, typeTarget->baseName, typeTarget->baseNs);
     }
 }
 
@@ -63,7 +64,7 @@ void ZrXmlSchemaBrowser::doFacet(xercesc::AttributeList& attrs, SimpleTypeDef& t
                                  const XMLCh* facetName) {
     struct TextFacet {
         std::u16string_view name;
-        ZrWString SimpleTypeDef::*field;
+        ZrName SimpleTypeDef::*field;
     };
 
     static constexpr TextFacet kTextFacets[] = {
@@ -82,12 +83,12 @@ void ZrXmlSchemaBrowser::doFacet(xercesc::AttributeList& attrs, SimpleTypeDef& t
         {u"duration", &SimpleTypeDef::duration},
     };
 
-    ZrWString value;
+    ZrName value;
     bool hasValue = false;
     for (XMLSize_t i = 0; i < attrs.getLength(); ++i) {
-        ZrXmlUtils::XMLChToWchar(attrs.getName(i), type.facetAttrName, false);
-        ZrXmlUtils::XMLChToWchar(attrs.getValue(i), type.facetAttrValue, false);
-        if (type.facetAttrName.view() == u"value") {
+        type.facetAttrName = names.intern(xmlText(attrs.getName(i)));
+        type.facetAttrValue = names.intern(xmlText(attrs.getValue(i)));
+        if (type.facetAttrName == u"value") {
             value = type.facetAttrValue;
             hasValue = true;
         }

@@ -2,6 +2,7 @@
 #include "zrglob.h"
 
 #include <string_view>
+#include <vector>
 
 namespace {
 
@@ -9,6 +10,35 @@ namespace {
 // for at once. Real schemas nest a few dozen deep; the bound keeps a hostile
 // document from growing the saved state without limit.
 constexpr size_t kMaxOpenComponents = 10000;
+
+// A dispatch table's entries grouped by the length of their names, so that a tag
+// is compared only with the few names of its own length, in table order.
+template <class Entry, size_t N> class TagIndex {
+  public:
+    explicit TagIndex(const Entry (&table)[N]) : table_(table) {
+        for (size_t i = 0; i < N; ++i) {
+            const size_t length = table[i].name.size();
+            if (length >= byLength_.size())
+                byLength_.resize(length + 1);
+            byLength_[length].push_back(&table[i]);
+        }
+    }
+
+    // The first entry named `name`, or null.
+    const Entry* find(std::u16string_view name) const {
+        if (name.size() >= byLength_.size())
+            return nullptr;
+        for (const Entry* entry : byLength_[name.size()]) {
+            if (zrSameText(entry->name, name))
+                return entry;
+        }
+        return nullptr;
+    }
+
+  private:
+    const Entry (&table_)[N];
+    std::vector<std::vector<const Entry*>> byLength_;
+};
 
 } // namespace
 
@@ -54,6 +84,7 @@ void ZrXmlSchemaBrowser::startElement(const XMLCh* name, xercesc::AttributeList&
         {u"duration", &ZrXmlSchemaBrowser::doFacetTag},
         {u"enumeration", &ZrXmlSchemaBrowser::doFacetTag},
     };
+    static const TagIndex kStartIndex(kStartTable);
 
     if (skipDepth != 0) {
         ++skipDepth;
@@ -72,24 +103,20 @@ void ZrXmlSchemaBrowser::startElement(const XMLCh* name, xercesc::AttributeList&
         uri = namespaceOfPrefix(local.substr(0, colon));
         local.remove_prefix(colon + 1);
     }
+    // The local part ends where the tag's name does, so it stays null-terminated.
     tagLocal = local;
     const std::u16string_view ns = uri ? uri->view() : std::u16string_view();
     if (local == u"schema")
         schemaNamespace = ns;
-    if (ns != schemaNamespace.view()) {
+    if (!zrSameText(ns, schemaNamespace.view())) {
         tagNamespace = ns;
         ZrGlob::LogMessage(ZR_SEV_NOTICE, 0,
                            "Element '%S' not in XMLSchema namespace (is '%S', should be '%S'",
-                           tagLocal.c_str(), tagNamespace.c_str(), schemaNamespace.c_str());
+                           ZrWString(local).c_str(), tagNamespace.c_str(), schemaNamespace.c_str());
     }
 
-    for (const StartAction& entry : kStartTable) {
-        if (entry.name == tagLocal.view()) {
-            if (entry.act)
-                (this->*entry.act)(attrs);
-            return;
-        }
-    }
+    if (const StartAction* entry = kStartIndex.find(local); entry && entry->act)
+        (this->*entry->act)(attrs);
 }
 
 void ZrXmlSchemaBrowser::endElement(const XMLCh* name) {
@@ -108,6 +135,7 @@ void ZrXmlSchemaBrowser::endElement(const XMLCh* name) {
         {u"group", &ZrXmlSchemaBrowser::finishGroup},
         {u"attributeGroup", &ZrXmlSchemaBrowser::finishGroup},
     };
+    static const TagIndex kEndIndex(kEndTable);
 
     // The end tags of a skipped subtree, the skipping element's and a list's own
     // included, only unwind the count.
@@ -120,12 +148,8 @@ void ZrXmlSchemaBrowser::endElement(const XMLCh* name) {
     const size_t colon = local.find(u':');
     if (colon != std::u16string_view::npos)
         local.remove_prefix(colon + 1);
-    for (const EndAction& entry : kEndTable) {
-        if (entry.name == local) {
-            (this->*entry.act)();
-            return;
-        }
-    }
+    if (const EndAction* entry = kEndIndex.find(local))
+        (this->*entry->act)();
 }
 
 void ZrXmlSchemaBrowser::skipSubtree(xercesc::AttributeList&) { skipDepth = 1; }
@@ -135,7 +159,7 @@ void ZrXmlSchemaBrowser::doElementTag(xercesc::AttributeList& attrs) { doElement
 void ZrXmlSchemaBrowser::doAttributeTag(xercesc::AttributeList& attrs) { doElement(attrs, true); }
 
 void ZrXmlSchemaBrowser::doFacetTag(xercesc::AttributeList& attrs) {
-    doFacet(attrs, currentSimpleType, tagLocal.c_str());
+    doFacet(attrs, currentSimpleType, tagLocal.data());
 }
 
 void ZrXmlSchemaBrowser::doSimpleContent(xercesc::AttributeList&) {

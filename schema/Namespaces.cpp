@@ -1,6 +1,7 @@
 #include "ZrXmlSchemaBrowser.h"
 #include "zrglob.h"
 
+#include <iterator>
 #include <string_view>
 
 namespace {
@@ -38,30 +39,34 @@ void ZrXmlSchemaBrowser::FirstElementAttrs(xercesc::AttributeList& attrs) {
     }
 }
 
-void ZrXmlSchemaBrowser::parseName(const XMLCh* name, bool useDefault, ZrWString& localPart,
-                                   ZrWString& ns) {
-    std::u16string_view text = name ? std::u16string_view(name) : std::u16string_view();
-    // The outputs are overwritten below; a name that lives in one of them is
-    // copied out first.
-    ZrWString aliased;
-    if (!text.empty() && (text.data() == localPart.c_str() || text.data() == ns.c_str())) {
-        aliased = text;
-        text = aliased.view();
-    }
-
+void ZrXmlSchemaBrowser::parseName(const XMLCh* name, bool useDefault, ZrName& localPart,
+                                   ZrName& ns) {
+    std::u16string_view text = xmlText(name);
     const ZrWString* uri = useDefault ? &defaultNamespace : &targetNamespace;
     const size_t colon = text.find(u':');
     if (colon != std::u16string_view::npos) {
         uri = namespaceOfPrefix(text.substr(0, colon));
         text.remove_prefix(colon + 1);
     }
-    // An unknown prefix leaves no namespace: the empty text. Assigning views reuses
-    // whatever storage the outputs already have.
-    if (uri)
-        ns = uri->view();
-    else
-        ns.clear();
-    localPart = text;
+    // Both results are taken before either output changes, since the name may be
+    // the text of one of them. An unknown prefix leaves no namespace: the empty text.
+    ZrName foundNs = uri ? namespaceName(uri->view()) : ZrName();
+    ZrName foundLocal = names.intern(text);
+    ns = std::move(foundNs);
+    localPart = std::move(foundLocal);
+}
+
+// A schema names its few namespaces over and over: the last ones met are compared
+// before the pool is asked.
+ZrName ZrXmlSchemaBrowser::namespaceName(std::u16string_view uri) {
+    for (const ZrName& recent : recentNamespaces) {
+        if (zrSameText(recent.view(), uri))
+            return recent;
+    }
+    ZrName name = names.intern(uri);
+    recentNamespaces[nextRecentNamespace] = name;
+    nextRecentNamespace = (nextRecentNamespace + 1) % std::size(recentNamespaces);
+    return name;
 }
 
 const XMLCh* ZrXmlSchemaBrowser::LookupNamespace(const XMLCh* prefix) {
@@ -70,13 +75,12 @@ const XMLCh* ZrXmlSchemaBrowser::LookupNamespace(const XMLCh* prefix) {
     return uri ? uri->c_str() : nullptr;
 }
 
-// Runs for nearly every tag and qualified attribute value: the key goes through a
-// buffer that keeps its storage rather than a new string per lookup.
+// Runs for nearly every tag and qualified attribute value: the table is searched
+// with the view itself.
 const ZrWString* ZrXmlSchemaBrowser::namespaceOfPrefix(std::u16string_view prefix) {
     if (prefix == std::u16string_view(kTargetPrefix))
         return &targetNamespace;
-    prefixKey = prefix;
-    const auto it = namespacePrefixes.find(prefixKey);
+    const auto it = namespacePrefixes.find(prefix);
     return it == namespacePrefixes.end() ? nullptr : &it->second;
 }
 

@@ -118,6 +118,7 @@ bool ZrXmlSchemaBrowser::ReadSchema(const ZrWChar* path, bool qualified) {
         globalElements.clear();
         anonCounter = 0;
         groupOpenedDefinition.clear();
+        names.clear();
 
         records.Clear();
         recordsByName.clear();

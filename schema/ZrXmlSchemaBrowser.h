@@ -28,6 +28,11 @@
 
 static_assert(std::is_same_v<XMLCh, char16_t>, "the host's wide text must be the parser's XMLCh");
 
+// The parser's text as a view; null reads as the empty text.
+inline std::u16string_view xmlText(const XMLCh* text) {
+    return text ? std::u16string_view(text) : std::u16string_view();
+}
+
 XERCES_CPP_NAMESPACE_BEGIN
 class SAXParser;
 XERCES_CPP_NAMESPACE_END
@@ -38,6 +43,15 @@ class ZrXmlSchemaBrowserTestAccess;
 constexpr int kBuiltinTypeCount = 95;
 // The built-in type-definition strings, null-terminated, in lookup order.
 extern const char* const kBuiltinTypeDefinitions[kBuiltinTypeCount + 1];
+
+// Orders the prefix table and lets it be searched with a view of the prefix, so
+// resolving a name copies nothing.
+struct PrefixOrder {
+    using is_transparent = void;
+    bool operator()(const ZrWString& a, const ZrWString& b) const { return a.view() < b.view(); }
+    bool operator()(const ZrWString& a, std::u16string_view b) const { return a.view() < b; }
+    bool operator()(std::u16string_view a, const ZrWString& b) const { return a < b.view(); }
+};
 
 class ZRBXMLS_API ZrXmlSchemaBrowser : public xercesc::HandlerBase {
 public:
@@ -79,10 +93,12 @@ private:
 
     // Namespaces and qualified names.
     void FirstElementAttrs(xercesc::AttributeList& attrs);
-    void parseName(const XMLCh* name, bool useDefault, ZrWString& localPart, ZrWString& ns);
+    void parseName(const XMLCh* name, bool useDefault, ZrName& localPart, ZrName& ns);
     const XMLCh* LookupNamespace(const XMLCh* prefix);
     // The namespace bound to `prefix`, or null when none is.
     const ZrWString* namespaceOfPrefix(std::u16string_view prefix);
+    // The pool's copy of a namespace's text.
+    ZrName namespaceName(std::u16string_view uri);
     const XMLCh* ReverseNamespace(const XMLCh* uri, bool useTargetPrefix);
 
     // Handlers of schema constructs.
@@ -99,7 +115,7 @@ private:
     void doRestriction(xercesc::AttributeList& attrs);
     void finishRestriction();
     void doList(xercesc::AttributeList& attrs);
-    static void doFacet(xercesc::AttributeList& attrs, SimpleTypeDef& type, const XMLCh* facetName);
+    void doFacet(xercesc::AttributeList& attrs, SimpleTypeDef& type, const XMLCh* facetName);
     void doInclude(xercesc::AttributeList& attrs);
     void finishInclude();
 
@@ -136,16 +152,16 @@ private:
                            ZrRecord* record);
     bool addSimpleContentField(const ComplexTypeDef& type, const ZrWString& recordName,
                                ZrRecord* record);
-    bool addTextField(const ZrWString& recordName, const ZrWString& typeName,
-                      const ZrWString& typeNs, ZrRecord* record);
+    bool addTextField(const ZrWString& recordName, const ZrName& typeName, const ZrName& typeNs,
+                      ZrRecord* record);
     bool addReference(const ElementDef& reference, ZrRecord* record);
     bool addGroup(const ElementDef& reference, ZrRecord* record);
     bool addSimpleField(const ElementDef& declaration, ZrRecord* record);
-    ZrWString qualifiedName(const ZrWString& ns, const ZrWString& local, bool useTargetPrefix);
+    ZrWString qualifiedName(const ZrName& ns, const ZrName& local, bool useTargetPrefix);
     ZrWString recordName(const ZrWString& qualified) const;
     bool isExpanding(const void* component) const;
-    bool nestingTooDeep(const ZrWString& where);
-    bool takeBuildStep(const ZrWString& where);
+    bool nestingTooDeep(const XMLCh* where);
+    bool takeBuildStep(const XMLCh* where);
     long buildStepBudget() const;
     bool recordHasField(const ZrRecord* record, const ZrWString& name) const;
     void noteField(const ZrRecord* record, const ZrWString& name);
@@ -195,8 +211,8 @@ private:
     // Namespace state.
     ZrWString defaultNamespace;
     ZrWString targetNamespace;
-    std::map<ZrWString, ZrWString> namespacePrefixes;
-    // Scratch key of prefix lookups.
+    std::map<ZrWString, ZrWString, PrefixOrder> namespacePrefixes;
+    // Scratch key of the URI index's lookups.
     ZrWString prefixKey;
     // ReverseNamespace's scan of namespacePrefixes kept as an index: for each URI the
     // first prefix in table order bound to it. Rebuilt before use when the table may
@@ -210,12 +226,16 @@ private:
     // Scratch text of the current tag and attribute.
     ZrWString nameBuffer;
     ZrWString valueBuffer;
+    // One shared copy of each name, namespace and facet value the model holds.
+    ZrNamePool names;
+    ZrName recentNamespaces[4];
+    size_t nextRecentNamespace = 0;
 
     // Scratch text of addSimpleField: the field's type name as text, and the local
     // part and namespace read back from it.
     ZrWString fieldTypeText;
-    ZrWString fieldTypeLocal;
-    ZrWString fieldTypeNs;
+    ZrName fieldTypeLocal;
+    ZrName fieldTypeNs;
 
     // Qualified names of the records under construction, outermost first.
     std::vector<ZrWString> recordWorkList;
@@ -224,8 +244,9 @@ private:
     ZrURI documentURI;
     // Path of the document being parsed, as queued; named in messages.
     ZrWString documentPath;
-    // Local part and namespace of the tag being dispatched.
-    ZrWString tagLocal;
+    // Local part of the tag being dispatched, inside the parser's own name (and
+    // null-terminated there), and its namespace when a notice names it.
+    std::u16string_view tagLocal;
     ZrWString tagNamespace;
 
     // For each open "group"/"attributeGroup" element: whether its start opened a

@@ -31,7 +31,7 @@ public:
     SimpleTypeDef*& typeTarget() { return b.typeTarget; }
     ZrWString& defaultNamespace() { return b.defaultNamespace; }
     ZrWString& targetNamespace() { return b.targetNamespace; }
-    std::map<ZrWString, ZrWString>& namespacePrefixes() { return b.namespacePrefixes; }
+    std::map<ZrWString, ZrWString, PrefixOrder>& namespacePrefixes() { return b.namespacePrefixes; }
     ZrWString& schemaNamespace() { return b.schemaNamespace; }
     std::vector<ZrWString>& recordWorkList() { return b.recordWorkList; }
     std::deque<ZrWString>& documentQueue() { return b.documentQueue; }
@@ -39,8 +39,15 @@ public:
     const ZrDType* const* builtinTypePointers() { return b.builtinTypePointers.get(); }
 
     // Operations.
-    void parseName(const XMLCh* name, bool useDefault, ZrWString& local, ZrWString& ns) {
+    void parseName(const XMLCh* name, bool useDefault, ZrName& local, ZrName& ns) {
         b.parseName(name, useDefault, local, ns);
+    }
+    void parseName(const XMLCh* name, bool useDefault, ZrWString& local, ZrWString& ns) {
+        ZrName localName;
+        ZrName nsName;
+        b.parseName(name, useDefault, localName, nsName);
+        local = localName.view();
+        ns = nsName.view();
     }
     const XMLCh* LookupNamespace(const XMLCh* prefix) { return b.LookupNamespace(prefix); }
     const XMLCh* ReverseNamespace(const XMLCh* uri, bool useTargetPrefix) {
@@ -71,6 +78,7 @@ private:
 namespace zrtest {
 
 inline std::string utf8(const ZrWString& s) { return zrUtf16ToUtf8(s.view()); }
+inline std::string utf8(const ZrName& s) { return zrUtf16ToUtf8(s.view()); }
 inline std::string utf8(std::u16string_view s) { return zrUtf16ToUtf8(s); }
 inline ZrWString wide(std::string_view s) { return ZrWString(zrUtf8ToUtf16(s)); }
 

@@ -239,7 +239,7 @@ SimpleTypeDef simpleType(const std::string& text) {
     SimpleTypeDef type;
     type.name = wide(name);
     type.baseName = wide(base);
-    const std::map<std::string, ZrWString SimpleTypeDef::*> members = {
+    const std::map<std::string, ZrName SimpleTypeDef::*> members = {
         {"length", &SimpleTypeDef::length},    {"maxLength", &SimpleTypeDef::maxLength},
         {"scale", &SimpleTypeDef::scale},      {"precision", &SimpleTypeDef::precision},
         {"min", &SimpleTypeDef::minInclusive}, {"max", &SimpleTypeDef::maxInclusive},

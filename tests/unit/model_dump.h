@@ -11,7 +11,7 @@ namespace zrtest {
 
 // "{ns}local", or "local" without a namespace; the XML Schema namespace prints
 // as "xs".
-inline std::string qname(const ZrWString& local, const ZrWString& ns) {
+inline std::string qname(const ZrName& local, const ZrName& ns) {
     if (ns.empty())
         return utf8(local);
     std::string uri = utf8(ns);
@@ -22,7 +22,7 @@ inline std::string qname(const ZrWString& local, const ZrWString& ns) {
 
 inline std::string dumpElement(const ElementDef& e) {
     std::string out = e.isAttribute ? "attribute" : "element";
-    auto part = [&out](const char* key, const ZrWString& local, const ZrWString& ns) {
+    auto part = [&out](const char* key, const ZrName& local, const ZrName& ns) {
         if (!local.empty() || !ns.empty())
             out += std::string(" ") + key + "=" + qname(local, ns);
     };
@@ -39,7 +39,7 @@ inline std::string dumpTypeParts(const SimpleTypeDef& t) {
     std::string out = qname(t.name, t.nameNs);
     if (!t.baseName.empty() || !t.baseNs.empty())
         out += " base=" + qname(t.baseName, t.baseNs);
-    const std::pair<const char*, const ZrWString*> facets[] = {{"minInclusive", &t.minInclusive},
+    const std::pair<const char*, const ZrName*> facets[] = {{"minInclusive", &t.minInclusive},
                                                                {"maxInclusive", &t.maxInclusive},
                                                                {"minExclusive", &t.minExclusive},
                                                                {"maxExclusive", &t.maxExclusive},

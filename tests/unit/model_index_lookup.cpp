@@ -184,9 +184,9 @@ void expectLookupsAgreeWithScans(ZrXmlSchemaBrowserTestAccess& access) {
     // Every name met, each asked in every namespace met: a lookup may carry any of them.
     std::set<std::u16string> names;
     std::set<std::u16string> spaces{u""};
-    auto addKey = [&](const ZrWString& name, const ZrWString& ns) {
-        names.insert(name.str());
-        spaces.insert(ns.str());
+    auto addKey = [&](const ZrName& name, const ZrName& ns) {
+        names.emplace(name.view());
+        spaces.emplace(ns.view());
     };
     auto addDeclaration = [&](const ElementDef& e) {
         addKey(e.typeName, e.typeNs);

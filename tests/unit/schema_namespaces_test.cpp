@@ -46,8 +46,8 @@ TEST(Namespaces, ParseNameSplitsAtTheFirstColonAndResolvesThePrefix) {
         EXPECT_EQ(utf8(ns), c.ns);
     }
     // The text may live in an output.
-    ZrWString local = wide("a:in");
-    ZrWString ns;
+    ZrName local(u"a:in");
+    ZrName ns;
     access.parseName(local.c_str(), true, local, ns);
     EXPECT_EQ(utf8(local) + " " + utf8(ns), "in urn:shared");
 }

@@ -1,0 +1,186 @@
+// Names, namespaces and facet values of the component model: immutable text that
+// copies share. A schema repeats the same few namespaces and many of its names on
+// every declaration, and the model saves, restores and stores its components by
+// value, so owning one string per field would cost an allocation per copy and a
+// heap block per repetition.
+#pragma once
+
+#include "zrstring.h"
+
+#include <cstddef>
+#include <cstdint>
+#include <cstring>
+#include <new>
+#include <string_view>
+#include <utility>
+#include <vector>
+
+// Equal texts. The standard comparison of char16_t text walks it one unit at a
+// time; names and namespaces are compared often enough for that to show.
+inline bool zrSameText(std::u16string_view a, std::u16string_view b) noexcept {
+    return a.size() == b.size() &&
+           (a.empty() || std::memcmp(a.data(), b.data(), a.size() * sizeof(char16_t)) == 0);
+}
+
+// A hash of the text's bytes, eight at a time. Not meant to resist chosen
+// collisions: it only spreads the names of a schema over a table.
+inline uint64_t zrTextHash(std::u16string_view text) noexcept {
+    constexpr uint64_t kMul = 0xbf58476d1ce4e5b9ull;
+    const unsigned char* p = reinterpret_cast<const unsigned char*>(text.data());
+    size_t n = text.size() * sizeof(char16_t);
+    uint64_t h = 0x9e3779b97f4a7c15ull ^ n;
+    for (; n >= 8; p += 8, n -= 8) {
+        uint64_t word;
+        std::memcpy(&word, p, 8);
+        h = (h ^ word) * kMul;
+        h ^= h >> 31;
+    }
+    if (n != 0) {
+        uint64_t word = 0;
+        std::memcpy(&word, p, n);
+        h = (h ^ word) * kMul;
+        h ^= h >> 31;
+    }
+    h *= 0x94d049bb133111ebull;
+    return h ^ (h >> 32);
+}
+
+class ZrName {
+public:
+    ZrName() noexcept = default;
+    ZrName(const ZrName& other) noexcept : rep_(other.rep_) { retain(); }
+    ZrName(ZrName&& other) noexcept : rep_(std::exchange(other.rep_, nullptr)) {}
+    explicit ZrName(std::u16string_view text) : rep_(make(text)) {}
+    ZrName(const char16_t* text) : rep_(make(text ? std::u16string_view(text) : std::u16string_view())) {}
+    ZrName(const ZrWString& text) : rep_(make(text.view())) {}
+    ~ZrName() { release(); }
+
+    ZrName& operator=(const ZrName& other) noexcept {
+        ZrName copy(other);
+        swap(copy);
+        return *this;
+    }
+    ZrName& operator=(ZrName&& other) noexcept {
+        ZrName moved(std::move(other));
+        swap(moved);
+        return *this;
+    }
+    ZrName& operator=(std::u16string_view text) { return *this = ZrName(text); }
+    ZrName& operator=(const char16_t* text) { return *this = ZrName(text); }
+    ZrName& operator=(const ZrWString& text) { return *this = ZrName(text.view()); }
+
+    std::u16string_view view() const noexcept {
+        return rep_ ? std::u16string_view(text(rep_), rep_->size) : std::u16string_view();
+    }
+    // Null-terminated; the empty text when the name is empty.
+    const char16_t* c_str() const noexcept { return rep_ ? text(rep_) : u""; }
+    bool empty() const noexcept { return rep_ == nullptr; }
+    long length() const noexcept { return rep_ ? static_cast<long>(rep_->size) : 0; }
+    void clear() noexcept {
+        release();
+        rep_ = nullptr;
+    }
+    void swap(ZrName& other) noexcept { std::swap(rep_, other.rep_); }
+    // True when both share one text, which equal names from one pool always do.
+    bool sameText(const ZrName& other) const noexcept { return rep_ == other.rep_; }
+
+    friend bool operator==(const ZrName& a, const ZrName& b) noexcept {
+        return a.rep_ == b.rep_ || a.view() == b.view();
+    }
+    friend bool operator!=(const ZrName& a, const ZrName& b) noexcept { return !(a == b); }
+    friend bool operator==(const ZrName& a, std::u16string_view b) noexcept { return a.view() == b; }
+    friend bool operator!=(const ZrName& a, std::u16string_view b) noexcept { return a.view() != b; }
+    friend bool operator==(const ZrName& a, const char16_t* b) noexcept {
+        return a.view() == (b ? std::u16string_view(b) : std::u16string_view());
+    }
+    friend bool operator!=(const ZrName& a, const char16_t* b) noexcept { return !(a == b); }
+    friend bool operator==(const ZrName& a, const ZrWString& b) noexcept { return a.view() == b.view(); }
+    friend bool operator!=(const ZrName& a, const ZrWString& b) noexcept { return a.view() != b.view(); }
+
+private:
+    // The text follows the header in the same block. The count is not atomic: a
+    // model belongs to one reader on one thread.
+    struct Rep {
+        size_t refs;
+        size_t size;
+    };
+
+    static char16_t* text(Rep* rep) noexcept { return reinterpret_cast<char16_t*>(rep + 1); }
+
+    // The empty text needs no block.
+    static Rep* make(std::u16string_view text) {
+        if (text.empty())
+            return nullptr;
+        void* block = ::operator new(sizeof(Rep) + (text.size() + 1) * sizeof(char16_t));
+        Rep* rep = new (block) Rep{1, text.size()};
+        std::memcpy(ZrName::text(rep), text.data(), text.size() * sizeof(char16_t));
+        ZrName::text(rep)[text.size()] = u'\0';
+        return rep;
+    }
+    void retain() noexcept {
+        if (rep_)
+            ++rep_->refs;
+    }
+    void release() noexcept {
+        if (rep_ && --rep_->refs == 0) {
+            rep_->~Rep();
+            ::operator delete(rep_);
+        }
+    }
+
+    Rep* rep_ = nullptr;
+};
+
+// One shared copy of each distinct text: names read through a pool cost a lookup
+// and no allocation once their text has been seen.
+class ZrNamePool {
+public:
+    ZrName intern(std::u16string_view text) {
+        if (text.empty())
+            return ZrName();
+        if ((count_ + 1) * 4 > slots_.size() * 3)
+            grow();
+        const uint64_t hash = zrTextHash(text);
+        const size_t mask = slots_.size() - 1;
+        for (size_t i = hash & mask;; i = (i + 1) & mask) {
+            Slot& slot = slots_[i];
+            if (slot.name.empty()) {
+                slot.hash = hash;
+                slot.name = ZrName(text);
+                ++count_;
+                return slot.name;
+            }
+            if (slot.hash == hash && zrSameText(slot.name.view(), text))
+                return slot.name;
+        }
+    }
+    // Forgets the texts; names handed out stay valid.
+    void clear() {
+        slots_.clear();
+        count_ = 0;
+    }
+    size_t size() const { return count_; }
+
+private:
+    struct Slot {
+        uint64_t hash = 0;
+        ZrName name; // empty: a free slot
+    };
+
+    void grow() {
+        std::vector<Slot> old(slots_.empty() ? 256 : slots_.size() * 2);
+        old.swap(slots_);
+        const size_t mask = slots_.size() - 1;
+        for (Slot& slot : old) {
+            if (slot.name.empty())
+                continue;
+            size_t i = slot.hash & mask;
+            while (!slots_[i].name.empty())
+                i = (i + 1) & mask;
+            slots_[i] = std::move(slot);
+        }
+    }
+
+    std::vector<Slot> slots_;
+    size_t count_ = 0;
+};
