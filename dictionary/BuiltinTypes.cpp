@@ -148,11 +148,15 @@ void ZrXmlSchemaBrowser::defineBuiltinTypes() {
     builtinTypePointers = std::make_unique<const ZrDType*[]>(count + 1);
     builtinByAlias.clear();
     builtinByUsage.clear();
+    builtinByWideAlias.clear();
+    builtinWideAliases.assign(size_t(count), std::u16string());
     for (int i = 0; i < count; ++i) {
         builtinTypes[i].Define(kBuiltinTypeDefinitions[i]);
         builtinTypePointers[i] = &builtinTypes[i];
         // emplace keeps the earliest entry, which is what a scan in list order finds.
         builtinByAlias.emplace(builtinTypes[i].Alias(), &builtinTypes[i]);
+        builtinWideAliases[size_t(i)] = zrUtf8ToUtf16(builtinTypes[i].Alias());
+        builtinByWideAlias.emplace(builtinWideAliases[size_t(i)], &builtinTypes[i]);
         builtinByUsage.emplace(builtinTypes[i].Usage(), &builtinTypes[i]);
     }
     builtinTypePointers[count] = nullptr;
@@ -166,6 +170,13 @@ const ZrDType* ZrXmlSchemaBrowser::TypeByName(const XMLCh* name) const {
     narrow.Assign(name, ZR_CSET_DEFAULT, -1);
     auto it = builtinByAlias.find(narrow.str());
     return it == builtinByAlias.end() ? nullptr : it->second;
+}
+
+// Type names come as wide text; the aliases, compared as UTF-8 bytes, are ASCII, so
+// comparing the wide text gives the same answers without converting every name.
+const ZrDType* ZrXmlSchemaBrowser::builtinByName(std::u16string_view name) const {
+    const auto it = builtinByWideAlias.find(name);
+    return it == builtinByWideAlias.end() ? nullptr : it->second;
 }
 
 const ZrDType* ZrXmlSchemaBrowser::TypeByUsage(short usage) const {

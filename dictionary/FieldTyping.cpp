@@ -79,22 +79,18 @@ bool limitsIgnoredFor(int usage) {
 
 } // namespace
 
-bool ZrXmlSchemaBrowser::lookupType(const XMLCh* localName, const XMLCh* namespaceURI,
-                                    ZrDType& type) {
-    if (!localName)
-        localName = u"";
-    if (!namespaceURI)
-        namespaceURI = u"";
+bool ZrXmlSchemaBrowser::lookupType(std::u16string_view localName,
+                                    std::u16string_view namespaceURI, ZrDType& type) {
     if (findComplexType(localName, namespaceURI)) {
         ZrGlob::LogMessage(ZR_SEV_NOTICE, 0, "Oops, lookupType asked to lookup a complex type");
         return false;
     }
-    const XMLCh* name = std::u16string_view(localName) == u"anyType" ? u"string" : localName;
+    const std::u16string_view name = localName == u"anyType" ? u"string" : localName;
 
     SimpleTypeDef* simpleType = simpleTypes.find(name, namespaceURI);
     if (!simpleType) {
         // Built-in aliases answer whatever namespace the name came with.
-        const ZrDType* builtin = TypeByName(name);
+        const ZrDType* builtin = builtinByName(name);
         if (!builtin)
             return false;
         type = *builtin;
@@ -124,7 +120,7 @@ bool ZrXmlSchemaBrowser::resolveSimpleType(SimpleTypeDef& simpleType) {
     if (!nestingTooDeep(simpleType.name.c_str())) {
         resolvingTypes.insert(&simpleType);
         based =
-            lookupType(simpleType.baseName.c_str(), simpleType.baseNs.c_str(), simpleType.dataType);
+            lookupType(simpleType.baseName.view(), simpleType.baseNs.view(), simpleType.dataType);
         resolvingTypes.erase(&simpleType);
     }
     --buildDepth;

@@ -106,11 +106,11 @@ ZrRecord* ZrXmlSchemaBrowser::buildRecord(const ElementDef& declaration) {
     record->name = name;
     recordsByName.emplace(std::move(name), record);
     recordWorkList.push_back(qualified);
-    fieldNamesOfOpenRecords.emplace_back(record, std::unordered_set<ZrWString>());
+    fieldNamesOfOpenRecords.emplace_back(record, ZrTextSet());
 
     bool built = false;
     const ComplexTypeDef* type =
-        findComplexType(declaration.typeName.c_str(), declaration.typeNs.c_str());
+        findComplexType(declaration.typeName.view(), declaration.typeNs.view());
     if (!type) {
         const ZrWString typeText = qualifiedName(declaration.typeNs, declaration.typeName, true);
         ZrGlob::LogMessage(ZR_SEV_ERROR, 4, "Unable to find complex type %S", typeText.c_str());
@@ -130,13 +130,13 @@ ZrRecord* ZrXmlSchemaBrowser::buildRecord(const ElementDef& declaration) {
 // (one a caller hands in directly) is searched.
 bool ZrXmlSchemaBrowser::recordHasField(const ZrRecord* record, const ZrWString& name) const {
     if (!fieldNamesOfOpenRecords.empty() && fieldNamesOfOpenRecords.back().first == record)
-        return fieldNamesOfOpenRecords.back().second.count(name) != 0;
+        return fieldNamesOfOpenRecords.back().second.contains(name.view());
     return record->GetFieldbyName(name) != nullptr;
 }
 
 void ZrXmlSchemaBrowser::noteField(const ZrRecord* record, const ZrWString& name) {
     if (!fieldNamesOfOpenRecords.empty() && fieldNamesOfOpenRecords.back().first == record)
-        fieldNamesOfOpenRecords.back().second.insert(name);
+        fieldNamesOfOpenRecords.back().second.insert(name.view());
 }
 
 // Draws in what `type` inherits: the text field of simple content, or the whole base
@@ -146,7 +146,7 @@ bool ZrXmlSchemaBrowser::addDerivedContent(const ComplexTypeDef& type, const ZrW
                                            ZrRecord* record) {
     if (type.baseName.empty())
         return true;
-    const ComplexTypeDef* base = findComplexType(type.baseName.c_str(), type.baseNs.c_str());
+    const ComplexTypeDef* base = findComplexType(type.baseName.view(), type.baseNs.view());
     if (type.simpleContent && !(base && !base->isGroup && base->simpleContent)) {
         // Text typed by a simple type. A base that is a complex type without simple
         // content cannot type text, and fails the field in lookupType.
@@ -185,6 +185,7 @@ bool ZrXmlSchemaBrowser::addSimpleContentField(const ComplexTypeDef& type,
     text.name = generatedName(anonCounter++);
     simpleTypes.push_back(std::move(text));
     const ZrName typeName = simpleTypes.back().name;
+    DepthScope temporary(temporaryTypes);
     if (!addTextField(recordName, typeName, ZrName(), record))
         return false; // the temporary type stays; the read fails anyway
     simpleTypes.pop_back();
@@ -208,15 +209,15 @@ bool ZrXmlSchemaBrowser::addField(const ElementDef& declaration, ZrRecord* recor
     if (!declaration.groupName.empty())
         return addGroup(declaration, record);
 
-    if (findComplexType(declaration.typeName.c_str(), declaration.typeNs.c_str())) {
+    if (findComplexType(declaration.typeName.view(), declaration.typeNs.view())) {
         const ZrRecord* nested = buildRecord(declaration);
         if (!nested)
             return false;
         // A record met again (a recursive type, or a name shared under unqualified
         // record names) gets one field in its parent, not one per occurrence.
         if (!recordHasField(record, nested->name)) {
-            record->NewField(recordType, nested->name);
-            noteField(record, nested->name);
+            const ZrField* field = record->NewField(recordType, nested->name);
+            noteField(record, field->FieldName());
         }
         return true;
     }
@@ -247,7 +248,7 @@ bool ZrXmlSchemaBrowser::addReference(const ElementDef& reference, ZrRecord* rec
 
 bool ZrXmlSchemaBrowser::addGroup(const ElementDef& reference, ZrRecord* record) {
     const ComplexTypeDef* group =
-        findComplexType(reference.groupName.c_str(), reference.groupNs.c_str());
+        findComplexType(reference.groupName.view(), reference.groupNs.view());
     if (!group) {
         ZrGlob::LogMessage(ZR_SEV_ERROR, 4, "Unable to find group %S", reference.groupName.c_str());
         return false;
@@ -270,6 +271,36 @@ bool ZrXmlSchemaBrowser::addGroup(const ElementDef& reference, ZrRecord* record)
 
 bool ZrXmlSchemaBrowser::addSimpleField(const ElementDef& declaration, ZrRecord* record) {
     ZrWString field = qualifiedName(declaration.nameNs, declaration.name, false);
+    ZrDType type;
+    if (!fieldType(declaration, field, type))
+        return false;
+    if (declaration.isAttribute) {
+        // Only usage and alias change; a type without an attribute variant keeps its alias.
+        const short usage = short(type.Usage() + 256);
+        type.Usage(usage);
+        if (const ZrDType* variant = TypeByUsage(usage))
+            type.Alias(variant->Alias());
+    }
+    type.Nulls(declaration.nullable);
+    // The host's NewField fails only by throwing bad_alloc, so its result needs no test.
+    const ZrField* added = record->NewField(type, std::move(field));
+    noteField(record, added->FieldName());
+    return true;
+}
+
+// The data type of a field declared with the declaration's type name, before its
+// attribute and nullable flags. A type found once is kept: with the model complete,
+// lookups of one name give one answer for the rest of the build. Only a temporary
+// type of simple content, which may share an "anon" name and exists for one lookup,
+// could change an answer, so nothing found while one exists is kept. Failures are
+// looked up again, so each says why.
+bool ZrXmlSchemaBrowser::fieldType(const ElementDef& declaration, const ZrWString& field,
+                                   ZrDType& type) {
+    const FieldTypeKey key{declaration.typeName.identity(), declaration.typeNs.identity()};
+    if (const auto it = fieldTypes.find(key); it != fieldTypes.end()) {
+        type = it->second.type;
+        return true;
+    }
     // The type name goes through its text form and back, as a prefixed name would.
     // The buffers are members, reused field after field: nothing below builds a
     // field, so they are not overwritten before the failure message names them.
@@ -287,24 +318,14 @@ bool ZrXmlSchemaBrowser::addSimpleField(const ElementDef& declaration, ZrRecord*
     if (local.empty())
         local = u"string";
 
-    ZrDType type;
-    if (!lookupType(local.c_str(), ns.c_str(), type)) {
+    if (!lookupType(local.view(), ns.view(), type)) {
         ZrGlob::LogMessage(ZR_SEV_ERROR, 0,
                            lgettext(u"Lookup of type '%s' (ns '%s') failed for field '%s'"),
                            local.c_str(), ns.c_str(), field.c_str());
         return false;
     }
-    if (declaration.isAttribute) {
-        // Only usage and alias change; a type without an attribute variant keeps its alias.
-        const short usage = short(type.Usage() + 256);
-        type.Usage(usage);
-        if (const ZrDType* variant = TypeByUsage(usage))
-            type.Alias(variant->Alias());
-    }
-    type.Nulls(declaration.nullable);
-    noteField(record, field);
-    // The host's NewField fails only by throwing bad_alloc, so its result needs no test.
-    record->NewField(type, std::move(field));
+    if (temporaryTypes == 0)
+        fieldTypes.emplace(key, FieldTypeEntry{declaration.typeName, declaration.typeNs, type});
     return true;
 }
 

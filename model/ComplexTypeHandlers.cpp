@@ -141,7 +141,7 @@ void ZrXmlSchemaBrowser::finishGroup() {
     --complexDepth;
 }
 
-ComplexTypeDef* ZrXmlSchemaBrowser::findComplexType(const XMLCh* localName,
-                                                    const XMLCh* namespaceURI) {
-    return complexTypes.find(localName ? localName : u"", namespaceURI ? namespaceURI : u"");
+ComplexTypeDef* ZrXmlSchemaBrowser::findComplexType(std::u16string_view localName,
+                                                    std::u16string_view namespaceURI) {
+    return complexTypes.find(localName, namespaceURI);
 }

@@ -81,8 +81,9 @@ public:
         rep_ = nullptr;
     }
     void swap(ZrName& other) noexcept { std::swap(rep_, other.rep_); }
-    // True when both share one text, which equal names from one pool always do.
-    bool sameText(const ZrName& other) const noexcept { return rep_ == other.rep_; }
+    // The shared text's address: equal for copies of one name, and for equal names
+    // from one pool; null for the empty name.
+    const void* identity() const noexcept { return rep_; }
 
     friend bool operator==(const ZrName& a, const ZrName& b) noexcept {
         return a.rep_ == b.rep_ || a.view() == b.view();
@@ -178,6 +179,58 @@ private:
             while (!slots_[i].name.empty())
                 i = (i + 1) & mask;
             slots_[i] = std::move(slot);
+        }
+    }
+
+    std::vector<Slot> slots_;
+    size_t count_ = 0;
+};
+
+// A set of texts stored elsewhere: each text must outlive its place in the set.
+class ZrTextSet {
+public:
+    bool contains(std::u16string_view text) const {
+        if (slots_.empty())
+            return false;
+        const uint64_t hash = zrTextHash(text);
+        const size_t mask = slots_.size() - 1;
+        for (size_t i = hash & mask;; i = (i + 1) & mask) {
+            const Slot& slot = slots_[i];
+            if (!slot.data)
+                return false;
+            if (slot.hash == hash && zrSameText(std::u16string_view(slot.data, slot.size), text))
+                return true;
+        }
+    }
+    void insert(std::u16string_view text) {
+        if (contains(text))
+            return;
+        if ((count_ + 1) * 4 > slots_.size() * 3)
+            grow();
+        place(Slot{zrTextHash(text), text.data() ? text.data() : u"", text.size()});
+        ++count_;
+    }
+
+private:
+    struct Slot {
+        uint64_t hash = 0;
+        const char16_t* data = nullptr; // null: a free slot
+        size_t size = 0;
+    };
+
+    void place(const Slot& slot) {
+        const size_t mask = slots_.size() - 1;
+        size_t i = slot.hash & mask;
+        while (slots_[i].data)
+            i = (i + 1) & mask;
+        slots_[i] = slot;
+    }
+    void grow() {
+        std::vector<Slot> old(slots_.empty() ? 16 : slots_.size() * 2);
+        old.swap(slots_);
+        for (const Slot& slot : old) {
+            if (slot.data)
+                place(slot);
         }
     }
 

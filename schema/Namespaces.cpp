@@ -9,6 +9,7 @@ namespace {
 // Stands for the target namespace in names the reader writes back as text, even
 // when the schema binds no prefix to it.
 constexpr XMLCh kTargetPrefix[] = u"zrxxxtrg";
+constexpr std::u16string_view kTargetPrefixText = kTargetPrefix;
 
 } // namespace
 
@@ -16,6 +17,7 @@ constexpr XMLCh kTargetPrefix[] = u"zrxxxtrg";
 // apply to its own name too, so they are read before that name is resolved.
 void ZrXmlSchemaBrowser::FirstElementAttrs(xercesc::AttributeList& attrs) {
     prefixOfUriStale = true;
+    recentPrefixesStale = true;
     for (XMLSize_t i = 0; i < attrs.getLength(); ++i) {
         ZrXmlUtils::XMLChToWchar(attrs.getName(i), nameBuffer, false);
         ZrXmlUtils::XMLChToWchar(attrs.getValue(i), valueBuffer, false);
@@ -75,20 +77,37 @@ const XMLCh* ZrXmlSchemaBrowser::LookupNamespace(const XMLCh* prefix) {
     return uri ? uri->c_str() : nullptr;
 }
 
-// Runs for nearly every tag and qualified attribute value: the table is searched
-// with the view itself.
+// Runs for nearly every tag and qualified attribute value, which mostly use one or
+// two prefixes: the last answers are kept, and forgotten when the table changes
+// (FirstElementAttrs, or a change in its size).
 const ZrWString* ZrXmlSchemaBrowser::namespaceOfPrefix(std::u16string_view prefix) {
-    if (prefix == std::u16string_view(kTargetPrefix))
+    if (prefix == kTargetPrefixText)
         return &targetNamespace;
+    if (recentPrefixesStale || recentPrefixesTableSize != namespacePrefixes.size()) {
+        for (RecentPrefix& recent : recentPrefixes)
+            recent.used = false;
+        recentPrefixesTableSize = namespacePrefixes.size();
+        recentPrefixesStale = false;
+    }
+    for (const RecentPrefix& recent : recentPrefixes) {
+        if (recent.used && zrSameText(recent.prefix.view(), prefix))
+            return recent.uri;
+    }
     const auto it = namespacePrefixes.find(prefix);
-    return it == namespacePrefixes.end() ? nullptr : &it->second;
+    const ZrWString* uri = it == namespacePrefixes.end() ? nullptr : &it->second;
+    RecentPrefix& slot = recentPrefixes[nextRecentPrefix];
+    nextRecentPrefix = (nextRecentPrefix + 1) % std::size(recentPrefixes);
+    slot.prefix = prefix;
+    slot.uri = uri;
+    slot.used = true;
+    return uri;
 }
 
 const XMLCh* ZrXmlSchemaBrowser::ReverseNamespace(const XMLCh* uri, bool useTargetPrefix) {
     const std::u16string_view text = uri ? std::u16string_view(uri) : std::u16string_view();
-    if (useTargetPrefix && targetNamespace == text)
+    if (useTargetPrefix && zrSameText(targetNamespace.view(), text))
         return kTargetPrefix;
-    if (defaultNamespace == text || targetNamespace == text)
+    if (zrSameText(defaultNamespace.view(), text) || zrSameText(targetNamespace.view(), text))
         return u"";
     // The table changes only here (FirstElementAttrs) and when a read empties it;
     // the size check also covers a table filled by other means.

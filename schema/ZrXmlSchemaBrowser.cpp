@@ -103,6 +103,7 @@ bool ZrXmlSchemaBrowser::ReadSchema(const ZrWChar* path, bool qualified) {
         defaultNamespace.clear();
         targetNamespace.clear();
         namespacePrefixes.clear();
+        recentPrefixesStale = true;
 
         elementStack.clear();
         currentElement.clear();
@@ -141,10 +142,11 @@ bool ZrXmlSchemaBrowser::ReadSchema(const ZrWChar* path, bool qualified) {
                 return false;
         }
 
+        fieldTypes.clear();
         for (size_t i = 0; i < globalElements.size(); ++i) {
             const ElementDef& declaration = globalElements[i];
             ComplexTypeDef* type =
-                findComplexType(declaration.typeName.c_str(), declaration.typeNs.c_str());
+                findComplexType(declaration.typeName.view(), declaration.typeNs.view());
             recordWorkList.clear();
             if (type && !buildRecord(declaration))
                 return false;

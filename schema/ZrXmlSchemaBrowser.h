@@ -143,7 +143,7 @@ private:
     void defineBuiltinTypes();
 
     // Model lookups.
-    ComplexTypeDef* findComplexType(const XMLCh* localName, const XMLCh* namespaceURI);
+    ComplexTypeDef* findComplexType(std::u16string_view localName, std::u16string_view namespaceURI);
 
     // Record construction.
     ZrRecord* buildRecord(const ElementDef& declaration);
@@ -157,6 +157,7 @@ private:
     bool addReference(const ElementDef& reference, ZrRecord* record);
     bool addGroup(const ElementDef& reference, ZrRecord* record);
     bool addSimpleField(const ElementDef& declaration, ZrRecord* record);
+    bool fieldType(const ElementDef& declaration, const ZrWString& field, ZrDType& type);
     ZrWString qualifiedName(const ZrName& ns, const ZrName& local, bool useTargetPrefix);
     ZrWString recordName(const ZrWString& qualified) const;
     bool isExpanding(const void* component) const;
@@ -164,10 +165,13 @@ private:
     bool takeBuildStep(const XMLCh* where);
     long buildStepBudget() const;
     bool recordHasField(const ZrRecord* record, const ZrWString& name) const;
+    // Notes a field just added; `name` is the field's own, which lives as long as it.
     void noteField(const ZrRecord* record, const ZrWString& name);
 
     // Field typing.
-    bool lookupType(const XMLCh* localName, const XMLCh* namespaceURI, ZrDType& type);
+    bool lookupType(std::u16string_view localName, std::u16string_view namespaceURI, ZrDType& type);
+    // The first built-in type whose alias is `name`, or null.
+    const ZrDType* builtinByName(std::u16string_view name) const;
     bool resolveSimpleType(SimpleTypeDef& simpleType);
     void dtLimits(ZrDType& type, const XMLCh* minInclusive, const XMLCh* maxInclusive,
                   const XMLCh* minExclusive, const XMLCh* maxExclusive);
@@ -190,6 +194,9 @@ private:
     // First built-in type per alias and per usage code: the answers of a scan in
     // list order, without the scan.
     std::unordered_map<std::string, const ZrDType*> builtinByAlias;
+    // The same, keyed by the aliases as wide text, which the views below point into.
+    std::vector<std::u16string> builtinWideAliases;
+    std::unordered_map<std::u16string_view, const ZrDType*> builtinByWideAlias;
     std::unordered_map<short, const ZrDType*> builtinByUsage;
 
     ZrRecordList records;
@@ -220,6 +227,16 @@ private:
     // name it writes back.
     std::unordered_map<ZrWString, ZrWString> prefixOfUri;
     bool prefixOfUriStale = true;
+    // The latest answers of namespaceOfPrefix; the URIs live in the table's nodes.
+    struct RecentPrefix {
+        ZrWString prefix;
+        const ZrWString* uri = nullptr;
+        bool used = false;
+    };
+    RecentPrefix recentPrefixes[2];
+    size_t nextRecentPrefix = 0;
+    bool recentPrefixesStale = true;
+    size_t recentPrefixesTableSize = 0;
     size_t prefixOfUriSize = 0;
     ZrWString schemaNamespace;
 
@@ -273,7 +290,31 @@ private:
     // The names of the fields given so far to each record under construction,
     // innermost last: whether a record already has a field of some name is then a
     // lookup, not a scan of a record that may hold many thousands of fields.
-    std::vector<std::pair<const ZrRecord*, std::unordered_set<ZrWString>>> fieldNamesOfOpenRecords;
+    // The sets view the fields' own names.
+    std::vector<std::pair<const ZrRecord*, ZrTextSet>> fieldNamesOfOpenRecords;
+    // The data type each named field type comes to, by the identities of the type's
+    // name and namespace (held, so they stay unique), for the rest of the read's
+    // record building: the namespaces and the model no longer change then.
+    struct FieldTypeKey {
+        const void* name;
+        const void* ns;
+        bool operator==(const FieldTypeKey& other) const {
+            return name == other.name && ns == other.ns;
+        }
+    };
+    struct FieldTypeKeyHash {
+        size_t operator()(const FieldTypeKey& key) const {
+            return std::hash<const void*>()(key.name) * 31 + std::hash<const void*>()(key.ns);
+        }
+    };
+    struct FieldTypeEntry {
+        ZrName name;
+        ZrName ns;
+        ZrDType type;
+    };
+    std::unordered_map<FieldTypeKey, FieldTypeEntry, FieldTypeKeyHash> fieldTypes;
+    // Temporary simple types of simple content in the model now.
+    int temporaryTypes = 0;
 };
 
 // Parser input over the host file proxy.

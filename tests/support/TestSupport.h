@@ -54,14 +54,14 @@ public:
         return b.ReverseNamespace(uri, useTargetPrefix);
     }
     ComplexTypeDef* findComplexType(const XMLCh* local, const XMLCh* ns) {
-        return b.findComplexType(local, ns);
+        return b.findComplexType(xmlText(local), xmlText(ns));
     }
     ZrRecord* buildRecord(const ElementDef& declaration) { return b.buildRecord(declaration); }
     bool addField(const ElementDef& declaration, ZrRecord* record) {
         return b.addField(declaration, record);
     }
     bool lookupType(const XMLCh* local, const XMLCh* ns, ZrDType& type) {
-        return b.lookupType(local, ns, type);
+        return b.lookupType(xmlText(local), xmlText(ns), type);
     }
     void dtLimits(ZrDType& type, const XMLCh* minInc, const XMLCh* maxInc, const XMLCh* minExc,
                   const XMLCh* maxExc) {
