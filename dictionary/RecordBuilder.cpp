@@ -87,6 +87,7 @@ ZrRecord* ZrXmlSchemaBrowser::buildRecord(const ElementDef& declaration) {
     if (recordWorkList.empty() && records.Count() == 0) {
         buildSteps = 0;
         buildStepLimit = 0;
+        fieldTypes.clear();
     }
     const ZrWString qualified = qualifiedName(declaration.nameNs, declaration.name, false);
     DepthScope depth(buildDepth);
@@ -209,7 +210,10 @@ bool ZrXmlSchemaBrowser::addField(const ElementDef& declaration, ZrRecord* recor
     if (!declaration.groupName.empty())
         return addGroup(declaration, record);
 
-    if (findComplexType(declaration.typeName.view(), declaration.typeNs.view())) {
+    // Only names that found no complex type are kept as field types, so a kept one
+    // spares the complex-type lookup.
+    const ZrDType* kept = keptFieldType(declaration);
+    if (!kept && findComplexType(declaration.typeName.view(), declaration.typeNs.view())) {
         const ZrRecord* nested = buildRecord(declaration);
         if (!nested)
             return false;
@@ -221,7 +225,7 @@ bool ZrXmlSchemaBrowser::addField(const ElementDef& declaration, ZrRecord* recor
         }
         return true;
     }
-    return addSimpleField(declaration, record);
+    return addSimpleField(declaration, record, kept);
 }
 
 // The global declaration stands in for the reference entirely, its attribute and
@@ -269,10 +273,13 @@ bool ZrXmlSchemaBrowser::addGroup(const ElementDef& reference, ZrRecord* record)
     return true;
 }
 
-bool ZrXmlSchemaBrowser::addSimpleField(const ElementDef& declaration, ZrRecord* record) {
+bool ZrXmlSchemaBrowser::addSimpleField(const ElementDef& declaration, ZrRecord* record,
+                                        const ZrDType* kept) {
     ZrWString field = qualifiedName(declaration.nameNs, declaration.name, false);
     ZrDType type;
-    if (!fieldType(declaration, field, type))
+    if (kept)
+        type = *kept;
+    else if (!fieldType(declaration, field, type))
         return false;
     if (declaration.isAttribute) {
         // Only usage and alias change; a type without an attribute variant keeps its alias.
@@ -296,11 +303,6 @@ bool ZrXmlSchemaBrowser::addSimpleField(const ElementDef& declaration, ZrRecord*
 // looked up again, so each says why.
 bool ZrXmlSchemaBrowser::fieldType(const ElementDef& declaration, const ZrWString& field,
                                    ZrDType& type) {
-    const FieldTypeKey key{declaration.typeName.identity(), declaration.typeNs.identity()};
-    if (const auto it = fieldTypes.find(key); it != fieldTypes.end()) {
-        type = it->second.type;
-        return true;
-    }
     // The type name goes through its text form and back, as a prefixed name would.
     // The buffers are members, reused field after field: nothing below builds a
     // field, so they are not overwritten before the failure message names them.
@@ -325,8 +327,15 @@ bool ZrXmlSchemaBrowser::fieldType(const ElementDef& declaration, const ZrWStrin
         return false;
     }
     if (temporaryTypes == 0)
-        fieldTypes.emplace(key, FieldTypeEntry{declaration.typeName, declaration.typeNs, type});
+        fieldTypes.emplace(FieldTypeKey{declaration.typeName.identity(), declaration.typeNs.identity()},
+                           FieldTypeEntry{declaration.typeName, declaration.typeNs, type});
     return true;
+}
+
+const ZrDType* ZrXmlSchemaBrowser::keptFieldType(const ElementDef& declaration) const {
+    const auto it =
+        fieldTypes.find(FieldTypeKey{declaration.typeName.identity(), declaration.typeNs.identity()});
+    return it == fieldTypes.end() ? nullptr : &it->second.type;
 }
 
 ZrWString ZrXmlSchemaBrowser::qualifiedName(const ZrName& ns, const ZrName& local,

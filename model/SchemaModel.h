@@ -178,12 +178,19 @@ private:
         }
         // Adds `pos` under `hash` unless an entry that matches is held already.
         template <class Eq> void insertFirst(size_t hash, size_t pos, Eq&& matches) {
-            if (find(hash, matches) != npos)
-                return;
             if ((count_ + 1) * 4 > slots_.size() * 3)
                 grow();
-            place(hash, pos);
-            ++count_;
+            const size_t mask = slots_.size() - 1;
+            for (size_t i = hash & mask;; i = (i + 1) & mask) {
+                Slot& slot = slots_[i];
+                if (slot.pos == npos) {
+                    slot = Slot{hash, pos};
+                    ++count_;
+                    return;
+                }
+                if (slot.hash == hash && matches(slot.pos))
+                    return;
+            }
         }
         // Removes the slot holding exactly `pos`, if any; backward-shift deletion
         // keeps every remaining key reachable from its home slot.

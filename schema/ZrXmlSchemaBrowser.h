@@ -156,8 +156,10 @@ private:
                       ZrRecord* record);
     bool addReference(const ElementDef& reference, ZrRecord* record);
     bool addGroup(const ElementDef& reference, ZrRecord* record);
-    bool addSimpleField(const ElementDef& declaration, ZrRecord* record);
+    // `kept`: the declaration's type as kept from an earlier field, or null.
+    bool addSimpleField(const ElementDef& declaration, ZrRecord* record, const ZrDType* kept);
     bool fieldType(const ElementDef& declaration, const ZrWString& field, ZrDType& type);
+    const ZrDType* keptFieldType(const ElementDef& declaration) const;
     ZrWString qualifiedName(const ZrName& ns, const ZrName& local, bool useTargetPrefix);
     ZrWString recordName(const ZrWString& qualified) const;
     bool isExpanding(const void* component) const;
