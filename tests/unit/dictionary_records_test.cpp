@@ -90,6 +90,47 @@ const RecordCase kCases[] = {
      "  noVariant: Record(258) 0/0/0 null\n"
      "  code: string attribute(272) 8/0/0 null\n"},
 
+    // A type met again types its field as the first one did, with attribute and
+    // nullable flags applied per field, also across records. The simple content's
+    // temporary types take the next generated names (anon2, anon3: the anonymous
+    // complex types took anon0 and anon1), and a declared "anon2" still answers
+    // first, for the temporary's lookup as for the fields that name it.
+    {"RepeatedFieldTypes",
+     R"(<xs:simpleType name="Code"><xs:restriction base="xs:string">
+          <xs:maxLength value="5"/></xs:restriction></xs:simpleType>
+        <xs:simpleType name="anon2"><xs:restriction base="xs:string">
+          <xs:maxLength value="9"/></xs:restriction></xs:simpleType>
+        <xs:complexType name="Amount"><xs:simpleContent><xs:extension base="xs:decimal">
+          <xs:attribute name="cur" type="Code"/></xs:extension></xs:simpleContent></xs:complexType>
+        <xs:element name="r"><xs:complexType><xs:sequence>
+          <xs:element name="a" type="Code"/>
+          <xs:element name="b" type="Code" nullable="false"/>
+          <xs:element name="amt" type="Amount"/>
+          <xs:element name="c" type="anon2"/>
+          <xs:element name="amt2" type="Amount"/>
+          <xs:element name="d" type="anon2"/>
+        </xs:sequence><xs:attribute name="e" type="Code"/></xs:complexType></xs:element>
+        <xs:element name="s"><xs:complexType><xs:sequence>
+          <xs:element name="f" type="Code"/>
+        </xs:sequence></xs:complexType></xs:element>)",
+     "r(0):\n"
+     "  a: string(16) 5/0/0 null\n"
+     "  b: string(16) 5/0/0 notnull\n"
+     "  amt: Record(2) 0/0/0 notnull\n"
+     "  c: string(16) 9/0/0 null\n"
+     "  amt2: Record(2) 0/0/0 notnull\n"
+     "  d: string(16) 9/0/0 null\n"
+     "  e: string attribute(272) 5/0/0 null\n"
+     "amt(0):\n"
+     "  amt: string(16) 9/0/0 null\n"
+     "  cur: string attribute(272) 5/0/0 null\n"
+     "amt2(0):\n"
+     "  amt2: decimal(20) 0/16/2 null\n"
+     "  cur: string attribute(272) 5/0/0 null\n"
+     "s(0):\n"
+     "  f: string(16) 5/0/0 null\n",
+     "", true, false, kTargetNs},
+
     {"NullableInheritedFromEnclosingDeclaration",
      R"(<xs:element name="r" nullable="false"><xs:complexType><xs:sequence>
           <xs:element name="inherits" type="xs:int"/>
