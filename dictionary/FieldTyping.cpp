@@ -79,8 +79,8 @@ bool limitsIgnoredFor(int usage) {
 
 } // namespace
 
-bool ZrXmlSchemaBrowser::lookupType(std::u16string_view localName,
-                                    std::u16string_view namespaceURI, ZrDType& type) {
+bool ZrXmlSchemaBrowser::lookupType(std::u16string_view localName, std::u16string_view namespaceURI,
+                                    ZrDType& type) {
     if (findComplexType(localName, namespaceURI)) {
         ZrGlob::LogMessage(ZR_SEV_NOTICE, 0, "Oops, lookupType asked to lookup a complex type");
         return false;

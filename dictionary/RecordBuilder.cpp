@@ -327,14 +327,15 @@ bool ZrXmlSchemaBrowser::fieldType(const ElementDef& declaration, const ZrWStrin
         return false;
     }
     if (temporaryTypes == 0)
-        fieldTypes.emplace(FieldTypeKey{declaration.typeName.identity(), declaration.typeNs.identity()},
-                           FieldTypeEntry{declaration.typeName, declaration.typeNs, type});
+        fieldTypes.emplace(
+            FieldTypeKey{declaration.typeName.identity(), declaration.typeNs.identity()},
+            FieldTypeEntry{declaration.typeName, declaration.typeNs, type});
     return true;
 }
 
 const ZrDType* ZrXmlSchemaBrowser::keptFieldType(const ElementDef& declaration) const {
-    const auto it =
-        fieldTypes.find(FieldTypeKey{declaration.typeName.identity(), declaration.typeNs.identity()});
+    const auto it = fieldTypes.find(
+        FieldTypeKey{declaration.typeName.identity(), declaration.typeNs.identity()});
     return it == fieldTypes.end() ? nullptr : &it->second.type;
 }
 

@@ -38,11 +38,9 @@ void ZrXmlSchemaBrowser::doComplexType(xercesc::AttributeList& attrs) {
         if (attr.substr(0, 5) == u"xmlns")
             ZrGlob::LogMessage(ZR_SEV_NOTICE, 0, "xmlns in complextype attrs");
         else if (attr == u"name")
-            parseName(value, false, currentComplexType.name,
-                      currentComplexType.nameNs);
+            parseName(value, false, currentComplexType.name, currentComplexType.nameNs);
         else if (attr == u"base")
-            parseName(value, true, currentComplexType.baseName,
-                      currentComplexType.baseNs);
+            parseName(value, true, currentComplexType.baseName, currentComplexType.baseNs);
     }
     nameIfAnonymous(currentComplexType.name, anonCounter);
 
@@ -73,8 +71,7 @@ void ZrXmlSchemaBrowser::doExtension(xercesc::AttributeList& attrs) {
         if (attr.substr(0, 5) == u"xmlns")
             ZrGlob::LogMessage(ZR_SEV_NOTICE, 0, "xmlns in extension attrs");
         else if (attr == u"base")
-            parseName(value, true, currentComplexType.baseName,
-                      currentComplexType.baseNs);
+            parseName(value, true, currentComplexType.baseName, currentComplexType.baseNs);
     }
 }
 

@@ -18,8 +18,7 @@ void ZrXmlSchemaBrowser::doSimpleType(xercesc::AttributeList& attrs) {
         else if (attr == u"name")
             parseName(value, false, currentSimpleType.name, currentSimpleType.nameNs);
         else if (attr == u"base")
-            parseName(value, true, currentSimpleType.baseName,
-                      currentSimpleType.baseNs);
+            parseName(value, true, currentSimpleType.baseName, currentSimpleType.baseNs);
     }
     if (currentSimpleType.name.empty()) {
         ZrWString generated;

@@ -46,13 +46,20 @@ inline uint64_t zrTextHash(std::u16string_view text) noexcept {
 }
 
 class ZrName {
-public:
+  public:
     ZrName() noexcept = default;
+
     ZrName(const ZrName& other) noexcept : rep_(other.rep_) { retain(); }
+
     ZrName(ZrName&& other) noexcept : rep_(std::exchange(other.rep_, nullptr)) {}
+
     explicit ZrName(std::u16string_view text) : rep_(make(text)) {}
-    ZrName(const char16_t* text) : rep_(make(text ? std::u16string_view(text) : std::u16string_view())) {}
+
+    ZrName(const char16_t* text)
+        : rep_(make(text ? std::u16string_view(text) : std::u16string_view())) {}
+
     ZrName(const ZrWString& text) : rep_(make(text.view())) {}
+
     ~ZrName() { release(); }
 
     ZrName& operator=(const ZrName& other) noexcept {
@@ -60,27 +67,37 @@ public:
         swap(copy);
         return *this;
     }
+
     ZrName& operator=(ZrName&& other) noexcept {
         ZrName moved(std::move(other));
         swap(moved);
         return *this;
     }
+
     ZrName& operator=(std::u16string_view text) { return *this = ZrName(text); }
+
     ZrName& operator=(const char16_t* text) { return *this = ZrName(text); }
+
     ZrName& operator=(const ZrWString& text) { return *this = ZrName(text.view()); }
 
     std::u16string_view view() const noexcept {
         return rep_ ? std::u16string_view(text(rep_), rep_->size) : std::u16string_view();
     }
+
     // Null-terminated; the empty text when the name is empty.
     const char16_t* c_str() const noexcept { return rep_ ? text(rep_) : u""; }
+
     bool empty() const noexcept { return rep_ == nullptr; }
+
     long length() const noexcept { return rep_ ? static_cast<long>(rep_->size) : 0; }
+
     void clear() noexcept {
         release();
         rep_ = nullptr;
     }
+
     void swap(ZrName& other) noexcept { std::swap(rep_, other.rep_); }
+
     // The shared text's address: equal for copies of one name, and for equal names
     // from one pool; null for the empty name.
     const void* identity() const noexcept { return rep_; }
@@ -88,17 +105,32 @@ public:
     friend bool operator==(const ZrName& a, const ZrName& b) noexcept {
         return a.rep_ == b.rep_ || a.view() == b.view();
     }
+
     friend bool operator!=(const ZrName& a, const ZrName& b) noexcept { return !(a == b); }
-    friend bool operator==(const ZrName& a, std::u16string_view b) noexcept { return a.view() == b; }
-    friend bool operator!=(const ZrName& a, std::u16string_view b) noexcept { return a.view() != b; }
+
+    friend bool operator==(const ZrName& a, std::u16string_view b) noexcept {
+        return a.view() == b;
+    }
+
+    friend bool operator!=(const ZrName& a, std::u16string_view b) noexcept {
+        return a.view() != b;
+    }
+
     friend bool operator==(const ZrName& a, const char16_t* b) noexcept {
         return a.view() == (b ? std::u16string_view(b) : std::u16string_view());
     }
-    friend bool operator!=(const ZrName& a, const char16_t* b) noexcept { return !(a == b); }
-    friend bool operator==(const ZrName& a, const ZrWString& b) noexcept { return a.view() == b.view(); }
-    friend bool operator!=(const ZrName& a, const ZrWString& b) noexcept { return a.view() != b.view(); }
 
-private:
+    friend bool operator!=(const ZrName& a, const char16_t* b) noexcept { return !(a == b); }
+
+    friend bool operator==(const ZrName& a, const ZrWString& b) noexcept {
+        return a.view() == b.view();
+    }
+
+    friend bool operator!=(const ZrName& a, const ZrWString& b) noexcept {
+        return a.view() != b.view();
+    }
+
+  private:
     // The text follows the header in the same block. The count is not atomic: a
     // model belongs to one reader on one thread.
     struct Rep {
@@ -118,10 +150,12 @@ private:
         ZrName::text(rep)[text.size()] = u'\0';
         return rep;
     }
+
     void retain() noexcept {
         if (rep_)
             ++rep_->refs;
     }
+
     void release() noexcept {
         if (rep_ && --rep_->refs == 0) {
             rep_->~Rep();
@@ -135,7 +169,7 @@ private:
 // One shared copy of each distinct text: names read through a pool cost a lookup
 // and no allocation once their text has been seen.
 class ZrNamePool {
-public:
+  public:
     ZrName intern(std::u16string_view text) {
         if (text.empty())
             return ZrName();
@@ -155,14 +189,16 @@ public:
                 return slot.name;
         }
     }
+
     // Forgets the texts; names handed out stay valid.
     void clear() {
         slots_.clear();
         count_ = 0;
     }
+
     size_t size() const { return count_; }
 
-private:
+  private:
     struct Slot {
         uint64_t hash = 0;
         ZrName name; // empty: a free slot
@@ -188,7 +224,7 @@ private:
 
 // A set of texts stored elsewhere: each text must outlive its place in the set.
 class ZrTextSet {
-public:
+  public:
     bool contains(std::u16string_view text) const {
         if (slots_.empty())
             return false;
@@ -202,6 +238,7 @@ public:
                 return true;
         }
     }
+
     void insert(std::u16string_view text) {
         if (contains(text))
             return;
@@ -211,7 +248,7 @@ public:
         ++count_;
     }
 
-private:
+  private:
     struct Slot {
         uint64_t hash = 0;
         const char16_t* data = nullptr; // null: a free slot
@@ -225,6 +262,7 @@ private:
             i = (i + 1) & mask;
         slots_[i] = slot;
     }
+
     void grow() {
         std::vector<Slot> old(slots_.empty() ? 16 : slots_.size() * 2);
         old.swap(slots_);

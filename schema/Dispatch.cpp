@@ -15,7 +15,7 @@ constexpr size_t kMaxOpenComponents = 10000;
 // is compared only with the few names of its own length, in table order.
 template <class Entry, size_t N> class TagIndex {
   public:
-    explicit TagIndex(const Entry (&table)[N]) : table_(table) {
+    explicit TagIndex(const Entry (&table)[N]) {
         for (size_t i = 0; i < N; ++i) {
             const size_t length = table[i].name.size();
             if (length >= byLength_.size())
@@ -36,7 +36,6 @@ template <class Entry, size_t N> class TagIndex {
     }
 
   private:
-    const Entry (&table_)[N];
     std::vector<std::vector<const Entry*>> byLength_;
 };
 
