@@ -169,6 +169,38 @@ TEST(NamedListLookups, RandomOperationsAnswerLikeAScan) {
     }
 }
 
+// The pool hands out one shared text per distinct text, also across its growth:
+// field types are kept by that identity, and equal texts with two identities would
+// only cost lookups, but two texts with one identity would mistype fields. Texts
+// differing only in their last unit, or in length, sit side by side.
+TEST(NamePool, OneIdentityPerTextThroughGrowth) {
+    ZrNamePool pool;
+    std::vector<std::u16string> texts;
+    for (int i = 0; i < 5000; ++i) {
+        std::u16string text = wide("name" + std::to_string(i)).str();
+        texts.push_back(text);
+        texts.push_back(text + u'\0');
+        texts.push_back(text.substr(0, text.size() - 1) + u'\xFFFF');
+    }
+    std::vector<ZrName> first;
+    for (const auto& text : texts)
+        first.push_back(pool.intern(text));
+    std::set<const void*> identities;
+    for (size_t i = 0; i < texts.size(); ++i) {
+        const ZrName again = pool.intern(texts[i]);
+        ASSERT_EQ(again.identity(), first[i].identity()) << i;
+        ASSERT_EQ(again.view(), std::u16string_view(texts[i])) << i;
+        identities.insert(again.identity());
+    }
+    // As many identities as distinct texts: the variants of name0 to name9 with their
+    // last unit replaced are one text.
+    EXPECT_EQ(identities.size(), std::set<std::u16string>(texts.begin(), texts.end()).size());
+    EXPECT_TRUE(pool.intern(u"").empty());
+    // Names outlive the pool's table.
+    pool.clear();
+    EXPECT_EQ(first[3].view(), std::u16string_view(texts[3]));
+}
+
 // --- whole reads ----------------------------------------------------------------------
 
 // Every lookup record building can make on the model of a finished read (each name
