@@ -7,6 +7,7 @@
 
 #include "zrstring.h"
 
+#include <chrono>
 #include <cstddef>
 #include <cstdint>
 #include <cstring>
@@ -22,13 +23,28 @@ inline bool zrSameText(std::u16string_view a, std::u16string_view b) noexcept {
            (a.empty() || std::memcmp(a.data(), b.data(), a.size() * sizeof(char16_t)) == 0);
 }
 
-// A hash of the text's bytes, eight at a time. Not meant to resist chosen
-// collisions: it only spreads the names of a schema over a table.
+// The hash's starting state, chosen per process (from where the program was loaded
+// and when it started), so that a schema cannot be prepared to make the probes of
+// the tables below collide. No answer depends on it: the tables only find things.
+// Taken at first use, so that no hash is made before it is set.
+inline uint64_t zrTextHashSeed() noexcept {
+    static const uint64_t seed = [] {
+        static const char anchor = 0;
+        uint64_t mixed = uint64_t(reinterpret_cast<uintptr_t>(&anchor)) ^
+                         uint64_t(std::chrono::steady_clock::now().time_since_epoch().count());
+        mixed = (mixed ^ (mixed >> 30)) * 0xbf58476d1ce4e5b9ull;
+        return mixed ^ (mixed >> 27);
+    }();
+    return seed;
+}
+
+// A hash of the text's bytes, eight at a time: it spreads the names of a schema over
+// a table, seeded as above.
 inline uint64_t zrTextHash(std::u16string_view text) noexcept {
     constexpr uint64_t kMul = 0xbf58476d1ce4e5b9ull;
     const unsigned char* p = reinterpret_cast<const unsigned char*>(text.data());
     size_t n = text.size() * sizeof(char16_t);
-    uint64_t h = 0x9e3779b97f4a7c15ull ^ n;
+    uint64_t h = zrTextHashSeed() ^ 0x9e3779b97f4a7c15ull ^ n;
     for (; n >= 8; p += 8, n -= 8) {
         uint64_t word;
         std::memcpy(&word, p, 8);
