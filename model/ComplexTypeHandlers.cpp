@@ -33,9 +33,9 @@ void ZrXmlSchemaBrowser::doComplexType(xercesc::AttributeList& attrs) {
     typeTarget = &currentComplexType;
 
     for (XMLSize_t i = 0; i < attrs.getLength(); ++i) {
-        const std::u16string_view attr = xmlText(attrs.getName(i));
+        const XmlName attr(attrs.getName(i));
         const XMLCh* value = attrs.getValue(i);
-        if (attr.substr(0, 5) == u"xmlns")
+        if (attr.startsWith(u"xmlns"))
             ZrGlob::LogMessage(ZR_SEV_NOTICE, 0, "xmlns in complextype attrs");
         else if (attr == u"name")
             parseName(value, false, currentComplexType.name, currentComplexType.nameNs);
@@ -66,9 +66,9 @@ void ZrXmlSchemaBrowser::finishComplexType() {
 // The base always belongs to the working complex type, whatever typeTarget says.
 void ZrXmlSchemaBrowser::doExtension(xercesc::AttributeList& attrs) {
     for (XMLSize_t i = 0; i < attrs.getLength(); ++i) {
-        const std::u16string_view attr = xmlText(attrs.getName(i));
+        const XmlName attr(attrs.getName(i));
         const XMLCh* value = attrs.getValue(i);
-        if (attr.substr(0, 5) == u"xmlns")
+        if (attr.startsWith(u"xmlns"))
             ZrGlob::LogMessage(ZR_SEV_NOTICE, 0, "xmlns in extension attrs");
         else if (attr == u"base")
             parseName(value, true, currentComplexType.baseName, currentComplexType.baseNs);
@@ -85,9 +85,9 @@ void ZrXmlSchemaBrowser::doGroup(xercesc::AttributeList& attrs) {
     ZrName refName;
     ZrName refNs;
     for (XMLSize_t i = 0; i < attrs.getLength(); ++i) {
-        const std::u16string_view attr = xmlText(attrs.getName(i));
+        const XmlName attr(attrs.getName(i));
         const XMLCh* value = attrs.getValue(i);
-        if (attr.substr(0, 5) == u"xmlns")
+        if (attr.startsWith(u"xmlns"))
             ZrGlob::LogMessage(ZR_SEV_NOTICE, 0, "xmlns in group attrs");
         else if (attr == u"name")
             parseName(value, false, groupName, groupNs);

@@ -12,9 +12,9 @@ void ZrXmlSchemaBrowser::doElement(xercesc::AttributeList& attrs, bool isAttribu
     currentElement.isAttribute = isAttribute;
 
     for (XMLSize_t i = 0; i < attrs.getLength(); ++i) {
-        const std::u16string_view attr = xmlText(attrs.getName(i));
+        const XmlName attr(attrs.getName(i));
         const XMLCh* value = attrs.getValue(i);
-        if (attr.substr(0, 5) == u"xmlns") {
+        if (attr.startsWith(u"xmlns")) {
             ZrGlob::LogMessage(ZR_SEV_NOTICE, 0, "xmlns in element attrs");
         } else if (attr == u"name") {
             parseName(value, false, currentElement.name, currentElement.nameNs);

@@ -11,9 +11,9 @@ void ZrXmlSchemaBrowser::doSimpleType(xercesc::AttributeList& attrs) {
     typeTarget = &currentSimpleType;
 
     for (XMLSize_t i = 0; i < attrs.getLength(); ++i) {
-        const std::u16string_view attr = xmlText(attrs.getName(i));
+        const XmlName attr(attrs.getName(i));
         const XMLCh* value = attrs.getValue(i);
-        if (attr.substr(0, 5) == u"xmlns")
+        if (attr.startsWith(u"xmlns"))
             ZrGlob::LogMessage(ZR_SEV_NOTICE, 0, "xmlns in complextype attrs");
         else if (attr == u"name")
             parseName(value, false, currentSimpleType.name, currentSimpleType.nameNs);
@@ -43,7 +43,7 @@ void ZrXmlSchemaBrowser::finishSimpleType() {
 // restrict: the base is dropped.
 void ZrXmlSchemaBrowser::doRestriction(xercesc::AttributeList& attrs) {
     for (XMLSize_t i = 0; i < attrs.getLength(); ++i) {
-        if (xmlText(attrs.getName(i)) != u"base" || !typeTarget)
+        if (XmlName(attrs.getName(i)) != u"base" || !typeTarget)
             continue;
         parseName(attrs.getValue(i), true, typeTarget->baseName, typeTarget->baseNs);
     }

@@ -95,13 +95,9 @@ void ZrXmlSchemaBrowser::startElement(const XMLCh* name, xercesc::AttributeList&
     }
     // The tag's name resolved as parseName would, but its namespace is only compared,
     // not kept: copying it for every tag costs more than the comparison.
-    std::u16string_view local = name ? std::u16string_view(name) : std::u16string_view();
-    const ZrWString* uri = &defaultNamespace;
-    const size_t colon = local.find(u':');
-    if (colon != std::u16string_view::npos) {
-        uri = namespaceOfPrefix(local.substr(0, colon));
-        local.remove_prefix(colon + 1);
-    }
+    const XmlQualifiedName tag(name);
+    const std::u16string_view local = tag.local;
+    const ZrWString* uri = tag.prefixed() ? namespaceOfPrefix(tag.prefix) : &defaultNamespace;
     // The local part ends where the tag's name does, so it stays null-terminated.
     tagLocal = local;
     const std::u16string_view ns = uri ? uri->view() : std::u16string_view();
@@ -143,11 +139,7 @@ void ZrXmlSchemaBrowser::endElement(const XMLCh* name) {
         return;
     }
     // Only the local part chooses the action; the end tag's namespace plays no part.
-    std::u16string_view local = name ? std::u16string_view(name) : std::u16string_view();
-    const size_t colon = local.find(u':');
-    if (colon != std::u16string_view::npos)
-        local.remove_prefix(colon + 1);
-    if (const EndAction* entry = kEndIndex.find(local))
+    if (const EndAction* entry = kEndIndex.find(XmlQualifiedName(name).local))
         (this->*entry->act)();
 }
 

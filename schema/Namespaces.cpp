@@ -43,17 +43,14 @@ void ZrXmlSchemaBrowser::FirstElementAttrs(xercesc::AttributeList& attrs) {
 
 void ZrXmlSchemaBrowser::parseName(const XMLCh* name, bool useDefault, ZrName& localPart,
                                    ZrName& ns) {
-    std::u16string_view text = xmlText(name);
+    const XmlQualifiedName text(name);
     const ZrWString* uri = useDefault ? &defaultNamespace : &targetNamespace;
-    const size_t colon = text.find(u':');
-    if (colon != std::u16string_view::npos) {
-        uri = namespaceOfPrefix(text.substr(0, colon));
-        text.remove_prefix(colon + 1);
-    }
+    if (text.prefixed())
+        uri = namespaceOfPrefix(text.prefix);
     // Both results are taken before either output changes, since the name may be
     // the text of one of them. An unknown prefix leaves no namespace: the empty text.
     ZrName foundNs = uri ? namespaceName(uri->view()) : ZrName();
-    ZrName foundLocal = names.intern(text);
+    ZrName foundLocal = names.intern(text.local);
     ns = std::move(foundNs);
     localPart = std::move(foundLocal);
 }

@@ -33,6 +33,54 @@ inline std::u16string_view xmlText(const XMLCh* text) {
     return text ? std::u16string_view(text) : std::u16string_view();
 }
 
+// An attribute name as the parser gives it, compared without measuring it first:
+// most differ from the name sought in their first unit.
+class XmlName {
+public:
+    explicit XmlName(const XMLCh* text) : text_(text ? text : u"") {}
+
+    // Stops at the first unit that differs, the terminator included.
+    bool startsWith(std::u16string_view prefix) const {
+        for (size_t i = 0; i < prefix.size(); ++i) {
+            if (text_[i] != prefix[i])
+                return false;
+        }
+        return true;
+    }
+    bool operator==(std::u16string_view name) const {
+        return startsWith(name) && text_[name.size()] == u'\0';
+    }
+    bool operator!=(std::u16string_view name) const { return !(*this == name); }
+    std::u16string_view view() const { return text_; }
+
+private:
+    const XMLCh* text_;
+};
+
+// A qualified name as the parser gives it, split at its first colon in one pass.
+struct XmlQualifiedName {
+    explicit XmlQualifiedName(const XMLCh* text) {
+        const XMLCh* p = text ? text : u"";
+        const XMLCh* end = p;
+        const XMLCh* colon = nullptr;
+        for (; *end; ++end) {
+            if (*end == u':' && !colon)
+                colon = end;
+        }
+        if (colon) {
+            prefix = std::u16string_view(p, size_t(colon - p));
+            local = std::u16string_view(colon + 1, size_t(end - colon - 1));
+        } else {
+            local = std::u16string_view(p, size_t(end - p));
+        }
+    }
+
+    bool prefixed() const { return prefix.data() != nullptr; }
+
+    std::u16string_view prefix; // null data when there is no colon
+    std::u16string_view local;  // null-terminated where the name is
+};
+
 XERCES_CPP_NAMESPACE_BEGIN
 class SAXParser;
 XERCES_CPP_NAMESPACE_END
