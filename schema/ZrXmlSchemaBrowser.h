@@ -51,7 +51,6 @@ public:
         return startsWith(name) && text_[name.size()] == u'\0';
     }
     bool operator!=(std::u16string_view name) const { return !(*this == name); }
-    std::u16string_view view() const { return text_; }
 
 private:
     const XMLCh* text_;
