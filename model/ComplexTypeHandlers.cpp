@@ -31,26 +31,31 @@ void ZrXmlSchemaBrowser::doComplexType(xercesc::AttributeList& attrs) {
         return;
     saveComplexType(currentComplexType, complexTypeStack);
     typeTarget = &currentComplexType;
+    beginTypeDefinition(attrs, currentComplexType);
+    ++complexDepth;
+}
 
+// The start of a simple or complex type: its name and base, a generated name when it
+// has none, and the type of the declaration around it when that names none.
+void ZrXmlSchemaBrowser::beginTypeDefinition(xercesc::AttributeList& attrs, SimpleTypeDef& type) {
     for (XMLSize_t i = 0; i < attrs.getLength(); ++i) {
         const XmlName attr(attrs.getName(i));
         const XMLCh* value = attrs.getValue(i);
         if (attr.startsWith(u"xmlns"))
             ZrGlob::LogMessage(ZR_SEV_NOTICE, 0, "xmlns in complextype attrs");
         else if (attr == u"name")
-            parseName(value, false, currentComplexType.name, currentComplexType.nameNs);
+            parseName(value, false, type.name, type.nameNs);
         else if (attr == u"base")
-            parseName(value, true, currentComplexType.baseName, currentComplexType.baseNs);
+            parseName(value, true, type.baseName, type.baseNs);
     }
-    nameIfAnonymous(currentComplexType.name, anonCounter);
+    nameIfAnonymous(type.name, anonCounter);
 
     // A type defined inside a declaration without a "type" attribute becomes its
     // type; outside any declaration this lands in the idle record.
     if (currentElement.typeName.empty()) {
-        currentElement.typeName = currentComplexType.name;
-        currentElement.typeNs = currentComplexType.nameNs;
+        currentElement.typeName = type.name;
+        currentElement.typeNs = type.nameNs;
     }
-    ++complexDepth;
 }
 
 void ZrXmlSchemaBrowser::finishComplexType() {

@@ -9,27 +9,7 @@
 void ZrXmlSchemaBrowser::doSimpleType(xercesc::AttributeList& attrs) {
     currentSimpleType.clear();
     typeTarget = &currentSimpleType;
-
-    for (XMLSize_t i = 0; i < attrs.getLength(); ++i) {
-        const XmlName attr(attrs.getName(i));
-        const XMLCh* value = attrs.getValue(i);
-        if (attr.startsWith(u"xmlns"))
-            ZrGlob::LogMessage(ZR_SEV_NOTICE, 0, "xmlns in complextype attrs");
-        else if (attr == u"name")
-            parseName(value, false, currentSimpleType.name, currentSimpleType.nameNs);
-        else if (attr == u"base")
-            parseName(value, true, currentSimpleType.baseName, currentSimpleType.baseNs);
-    }
-    if (currentSimpleType.name.empty()) {
-        ZrWString generated;
-        wsfmt(generated, u"anon%d", anonCounter++);
-        currentSimpleType.name = generated;
-    }
-
-    if (currentElement.typeName.empty()) {
-        currentElement.typeName = currentSimpleType.name;
-        currentElement.typeNs = currentSimpleType.nameNs;
-    }
+    beginTypeDefinition(attrs, currentSimpleType);
 }
 
 // The working record stays filled: facets met before the next simple type still

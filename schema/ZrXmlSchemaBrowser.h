@@ -152,6 +152,7 @@ private:
     void doElement(xercesc::AttributeList& attrs, bool isAttribute);
     void finishElement();
     void doComplexType(xercesc::AttributeList& attrs);
+    void beginTypeDefinition(xercesc::AttributeList& attrs, SimpleTypeDef& type);
     void finishComplexType();
     void doExtension(xercesc::AttributeList& attrs);
     void finishExtension();
