@@ -15,6 +15,7 @@
 #include <algorithm>
 #include <atomic>
 #include <benchmark/benchmark.h>
+#include <cctype>
 #include <chrono>
 #include <cstdio>
 #include <cstdlib>
@@ -154,10 +155,20 @@ std::string utf8(const XMLCh* text) {
 
 // --- the floor ----------------------------------------------------------------------
 
-// True for a directory the reader treats as absolute: a leading slash or backslash,
-// or a drive letter and colon.
-bool absoluteDirectory(const std::string& dir) {
-    return !dir.empty() && (dir[0] == '/' || dir[0] == '\\' || (dir.size() > 1 && dir[1] == ':'));
+// True for a location the reader uses as written: a leading slash or backslash, or
+// a drive letter and colon.
+bool absoluteLocation(const std::string& location) {
+    return !location.empty() &&
+           (location[0] == '/' || location[0] == '\\' ||
+            (location.size() > 1 && location[1] == ':' && std::isalpha((unsigned char)location[0])));
+}
+
+// A scheme such as "http:" or "file:": two or more letters and a colon.
+bool hasScheme(const std::string& location) {
+    size_t letters = 0;
+    while (letters < location.size() && std::isalpha((unsigned char)location[letters]))
+        ++letters;
+    return letters >= 2 && letters < location.size() && location[letters] == ':';
 }
 
 std::string directoryOf(const std::string& path) {
@@ -165,16 +176,18 @@ std::string directoryOf(const std::string& path) {
     return slash == std::string::npos ? std::string() : path.substr(0, slash + 1);
 }
 
-// Where the reader looks for an included document: relative locations are taken as
-// a file name in the including document's directory when that is absolute, and as
-// written otherwise.
+// Where the reader looks for an included document: a relative location is taken
+// from the directory of the including document, its own directory part kept.
 std::string includedPath(const std::string& including, const std::string& location) {
-    const std::string dir = directoryOf(including);
-    const std::string locationDir = directoryOf(location);
-    if (!absoluteDirectory(dir) || absoluteDirectory(locationDir) ||
-        location.find("://") != std::string::npos)
+    if (hasScheme(including) || hasScheme(location) || absoluteLocation(location))
         return location;
-    return dir + location.substr(locationDir.size());
+    return directoryOf(including) + location;
+}
+
+// The reader parses a document once however it is named: "a/../b.xsd" and "b.xsd"
+// are one document.
+std::string documentKey(const std::string& path) {
+    return std::filesystem::path(path).lexically_normal().string();
 }
 
 // Does no work but what reading the same documents needs: noting "include" elements.
@@ -215,7 +228,7 @@ std::vector<std::string> runFloor(const std::string& mainPath) {
     parser.setErrorHandler(&handler);
 
     std::vector<std::string> parsed;
-    std::set<std::string> queued{mainPath};
+    std::set<std::string> queued{documentKey(mainPath)};
     std::deque<std::string> queue{mainPath};
     while (!queue.empty()) {
         const std::string path = queue.front();
@@ -227,7 +240,7 @@ std::vector<std::string> runFloor(const std::string& mainPath) {
         parsed.push_back(path);
         for (const auto& location : handler.includes) {
             std::string included = includedPath(path, location);
-            if (queued.insert(included).second)
+            if (queued.insert(documentKey(included)).second)
                 queue.push_back(std::move(included));
         }
     }
