@@ -212,8 +212,6 @@ class ZrNamePool {
         count_ = 0;
     }
 
-    size_t size() const { return count_; }
-
   private:
     struct Slot {
         uint64_t hash = 0;
