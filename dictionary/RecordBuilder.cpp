@@ -89,12 +89,16 @@ ZrRecord* ZrXmlSchemaBrowser::buildRecord(const ElementDef& declaration) {
         buildStepLimit = 0;
         fieldTypes.clear();
     }
-    const ZrWString qualified = qualifiedName(declaration.nameNs, declaration.name, false);
+    ZrWString qualified = qualifiedName(declaration.nameNs, declaration.name, false);
     DepthScope depth(buildDepth);
     if (nestingTooDeep(qualified.c_str()) || !takeBuildStep(qualified.c_str()))
         return nullptr;
 
-    ZrWString name = recordName(qualified);
+    // Most records are named by their qualified name alone: no copy is made to look
+    // them up, since most lookups find a record already built.
+    const bool pathNamed = qualifiedRecords && recordWorkList.size() > 1;
+    ZrWString pathName = pathNamed ? recordName(qualified) : ZrWString();
+    const ZrWString& name = pathNamed ? pathName : qualified;
     auto existing = recordsByName.find(name);
     if (existing != recordsByName.end())
         return existing->second;
@@ -105,9 +109,13 @@ ZrRecord* ZrXmlSchemaBrowser::buildRecord(const ElementDef& declaration) {
         return nullptr;
     }
     record->name = name;
-    recordsByName.emplace(std::move(name), record);
-    recordWorkList.push_back(qualified);
-    fieldNamesOfOpenRecords.emplace_back(record, ZrTextSet());
+    recordsByName.emplace(pathNamed ? std::move(pathName) : qualified, record);
+    recordWorkList.push_back(std::move(qualified));
+    if (openRecordCount == openRecords.size())
+        openRecords.emplace_back();
+    OpenRecord& open = openRecords[openRecordCount++];
+    open.record = record;
+    open.fieldNames.clear();
 
     bool built = false;
     const ComplexTypeDef* type =
@@ -122,7 +130,7 @@ ZrRecord* ZrXmlSchemaBrowser::buildRecord(const ElementDef& declaration) {
             built = addField(*it, record);
     }
     // A failed record stays in the list with the fields added so far; the read fails.
-    fieldNamesOfOpenRecords.pop_back();
+    --openRecordCount;
     recordWorkList.pop_back();
     return built ? record : nullptr;
 }
@@ -130,14 +138,14 @@ ZrRecord* ZrXmlSchemaBrowser::buildRecord(const ElementDef& declaration) {
 // Fields are added only to the innermost record under construction; any other record
 // (one a caller hands in directly) is searched.
 bool ZrXmlSchemaBrowser::recordHasField(const ZrRecord* record, const ZrWString& name) const {
-    if (!fieldNamesOfOpenRecords.empty() && fieldNamesOfOpenRecords.back().first == record)
-        return fieldNamesOfOpenRecords.back().second.contains(name.view());
+    if (openRecordCount != 0 && openRecords[openRecordCount - 1].record == record)
+        return openRecords[openRecordCount - 1].fieldNames.contains(name.view());
     return record->GetFieldbyName(name) != nullptr;
 }
 
 void ZrXmlSchemaBrowser::noteField(const ZrRecord* record, const ZrWString& name) {
-    if (!fieldNamesOfOpenRecords.empty() && fieldNamesOfOpenRecords.back().first == record)
-        fieldNamesOfOpenRecords.back().second.insert(name.view());
+    if (openRecordCount != 0 && openRecords[openRecordCount - 1].record == record)
+        openRecords[openRecordCount - 1].fieldNames.insert(name.view());
 }
 
 // Draws in what `type` inherits: the text field of simple content, or the whole base

@@ -237,29 +237,36 @@ class ZrNamePool {
 };
 
 // A set of texts stored elsewhere: each text must outlive its place in the set.
+// Most sets are small (the field names of one record), so the first few texts sit
+// in place and are scanned; a table is built only once a set outgrows them, and
+// clear() keeps what was allocated, so a set used again allocates nothing.
 class ZrTextSet {
   public:
-    bool contains(std::u16string_view text) const {
-        if (slots_.empty())
-            return false;
-        const uint64_t hash = zrTextHash(text);
-        const size_t mask = slots_.size() - 1;
-        for (size_t i = hash & mask;; i = (i + 1) & mask) {
-            const Slot& slot = slots_[i];
-            if (!slot.data)
-                return false;
-            if (slot.hash == hash && zrSameText(std::u16string_view(slot.data, slot.size), text))
-                return true;
-        }
-    }
+    bool contains(std::u16string_view text) const { return find(text, zrTextHash(text)); }
 
     void insert(std::u16string_view text) {
-        if (contains(text))
+        const uint64_t hash = zrTextHash(text);
+        if (find(text, hash))
             return;
-        if ((count_ + 1) * 4 > slots_.size() * 3)
+        const Slot slot{hash, text.data() ? text.data() : u"", text.size()};
+        if (count_ < kInPlace) {
+            inPlace_[count_++] = slot;
+            return;
+        }
+        if (slots_.empty()) {
+            slots_.resize(4 * kInPlace);
+            for (const Slot& held : inPlace_)
+                place(held);
+        } else if ((count_ + 1) * 4 > slots_.size() * 3) {
             grow();
-        place(Slot{zrTextHash(text), text.data() ? text.data() : u"", text.size()});
+        }
+        place(slot);
         ++count_;
+    }
+
+    void clear() {
+        count_ = 0;
+        slots_.clear();
     }
 
   private:
@@ -268,6 +275,30 @@ class ZrTextSet {
         const char16_t* data = nullptr; // null: a free slot
         size_t size = 0;
     };
+
+    static constexpr size_t kInPlace = 8;
+
+    static bool holds(const Slot& slot, uint64_t hash, std::u16string_view text) {
+        return slot.hash == hash && zrSameText(std::u16string_view(slot.data, slot.size), text);
+    }
+
+    bool find(std::u16string_view text, uint64_t hash) const {
+        if (slots_.empty()) {
+            for (size_t i = 0; i < count_; ++i) {
+                if (holds(inPlace_[i], hash, text))
+                    return true;
+            }
+            return false;
+        }
+        const size_t mask = slots_.size() - 1;
+        for (size_t i = hash & mask;; i = (i + 1) & mask) {
+            const Slot& slot = slots_[i];
+            if (!slot.data)
+                return false;
+            if (holds(slot, hash, text))
+                return true;
+        }
+    }
 
     void place(const Slot& slot) {
         const size_t mask = slots_.size() - 1;
@@ -278,7 +309,7 @@ class ZrTextSet {
     }
 
     void grow() {
-        std::vector<Slot> old(slots_.empty() ? 16 : slots_.size() * 2);
+        std::vector<Slot> old(slots_.size() * 2);
         old.swap(slots_);
         for (const Slot& slot : old) {
             if (slot.data)
@@ -286,6 +317,7 @@ class ZrTextSet {
         }
     }
 
-    std::vector<Slot> slots_;
+    Slot inPlace_[kInPlace];
+    std::vector<Slot> slots_; // empty while the texts fit in place
     size_t count_ = 0;
 };

@@ -124,6 +124,7 @@ bool ZrXmlSchemaBrowser::ReadSchema(const ZrWChar* path, bool qualified) {
         records.Clear();
         recordsByName.clear();
         recordWorkList.clear();
+        openRecordCount = 0;
         documentQueue.clear();
         queuedDocuments.clear();
 
@@ -148,6 +149,7 @@ bool ZrXmlSchemaBrowser::ReadSchema(const ZrWChar* path, bool qualified) {
             ComplexTypeDef* type =
                 findComplexType(declaration.typeName.view(), declaration.typeNs.view());
             recordWorkList.clear();
+            openRecordCount = 0;
             if (type && !buildRecord(declaration))
                 return false;
         }

@@ -60,12 +60,13 @@ private:
 struct XmlQualifiedName {
     explicit XmlQualifiedName(const XMLCh* text) {
         const XMLCh* p = text ? text : u"";
+        // Up to the first colon, then on to the end with nothing left to test for.
         const XMLCh* end = p;
-        const XMLCh* colon = nullptr;
-        for (; *end; ++end) {
-            if (*end == u':' && !colon)
-                colon = end;
-        }
+        while (*end && *end != u':')
+            ++end;
+        const XMLCh* colon = *end ? end : nullptr;
+        while (*end)
+            ++end;
         if (colon) {
             prefix = std::u16string_view(p, size_t(colon - p));
             local = std::u16string_view(colon + 1, size_t(end - colon - 1));
@@ -323,7 +324,10 @@ private:
     // however often it is included.
     std::unordered_set<ZrWString> queuedDocuments;
     // Records built in the current read, by name.
-    std::unordered_map<ZrWString, ZrRecord*> recordsByName;
+    struct TextHash {
+        size_t operator()(const ZrWString& text) const { return size_t(zrTextHash(text.view())); }
+    };
+    std::unordered_map<ZrWString, ZrRecord*, TextHash> recordsByName;
 
     // Record-building guards. Groups, element references and base types being drawn
     // into the record under construction; entries below expansionFloor belong to the
@@ -340,8 +344,14 @@ private:
     // The names of the fields given so far to each record under construction,
     // innermost last: whether a record already has a field of some name is then a
     // lookup, not a scan of a record that may hold many thousands of fields.
-    // The sets view the fields' own names.
-    std::vector<std::pair<const ZrRecord*, ZrTextSet>> fieldNamesOfOpenRecords;
+    // The sets view the fields' own names. Entries past openRecordCount are kept
+    // for the next records, so that their sets allocate nothing.
+    struct OpenRecord {
+        const ZrRecord* record = nullptr;
+        ZrTextSet fieldNames;
+    };
+    std::vector<OpenRecord> openRecords;
+    size_t openRecordCount = 0;
     // The data type each named field type comes to, by the identities of the type's
     // name and namespace (held, so they stay unique), for the rest of the read's
     // record building: the namespaces and the model no longer change then.

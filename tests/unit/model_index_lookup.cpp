@@ -201,6 +201,29 @@ TEST(NamePool, OneIdentityPerTextThroughGrowth) {
     EXPECT_EQ(first[3].view(), std::u16string_view(texts[3]));
 }
 
+// A set answers like std::set at every size, across the change from the texts held in
+// place to a table and after being cleared and used again (as the field names of one
+// record after another are).
+TEST(TextSet, AgreesWithAnOrderedSetAcrossGrowthAndReuse) {
+    std::vector<std::u16string> texts;
+    for (int i = 0; i < 200; ++i)
+        texts.push_back(wide("field" + std::to_string(i % 70)).str()); // repeats from 70 on
+    texts.push_back(u"");
+    texts.push_back(std::u16string(u"field1") + u'\0');
+    ZrTextSet set;
+    for (size_t size : {0, 1, 8, 9, 33, 203, 5}) {
+        set.clear();
+        std::set<std::u16string> expected;
+        for (size_t i = 0; i < size && i < texts.size(); ++i) {
+            set.insert(texts[texts.size() - 1 - i]);
+            expected.insert(texts[texts.size() - 1 - i]);
+        }
+        for (const auto& text : texts)
+            ASSERT_EQ(set.contains(text), expected.count(text) == 1) << size << " " << text.size();
+        EXPECT_FALSE(set.contains(u"absent"));
+    }
+}
+
 // --- whole reads ----------------------------------------------------------------------
 
 // Every lookup record building can make on the model of a finished read (each name
