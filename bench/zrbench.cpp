@@ -424,7 +424,13 @@ double maxRssMB() {
 // False when the set cannot be read.
 bool measureSet(SetResult& set, const std::string& mainPath, bool qualified, bool timing,
                 int repetitions, CollectingReporter& reporter) {
-    set.documents = runFloor(mainPath);
+    // A set the floor cannot parse is reported and left out; the others still run.
+    try {
+        set.documents = runFloor(mainPath);
+    } catch (const std::exception& e) {
+        std::fprintf(stderr, "%s: %s\n", set.label.c_str(), e.what());
+        return false;
+    }
     for (const auto& doc : set.documents)
         set.textBytes += fs::file_size(doc);
     set.read = measuredRead(mainPath, qualified);
@@ -672,7 +678,8 @@ int main(int argc, char** argv) {
                 allRead = false;
             }
             allRead = allRead && ok && set.read.messages == 0 && set.read.records > 0;
-            results.push_back(std::move(set));
+            if (!set.documents.empty())
+                results.push_back(std::move(set));
             if (!options->keep && options->workDir.empty())
                 fs::remove_all(dir);
         }
@@ -682,7 +689,8 @@ int main(int argc, char** argv) {
             const bool ok = measureSet(set, schema, options->qualified, !options->check,
                                        options->repetitions, reporter);
             allRead = allRead && ok;
-            results.push_back(std::move(set));
+            if (!set.documents.empty())
+                results.push_back(std::move(set));
         }
 
         printTable(results);
