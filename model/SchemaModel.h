@@ -227,22 +227,10 @@ private:
         struct Slot {
             size_t hash = 0;
             size_t pos = npos;
+            bool free() const { return pos == npos; }
         };
 
-        void place(size_t hash, size_t pos) {
-            const size_t mask = slots_.size() - 1;
-            size_t i = hash & mask;
-            while (slots_[i].pos != npos)
-                i = (i + 1) & mask;
-            slots_[i] = Slot{hash, pos};
-        }
-        void grow() {
-            std::vector<Slot> old(slots_.empty() ? 16 : slots_.size() * 2);
-            old.swap(slots_);
-            for (const Slot& slot : old)
-                if (slot.pos != npos)
-                    place(slot.hash, slot.pos);
-        }
+        void grow() { zrRehashSlots(slots_, slots_.empty() ? 16 : slots_.size() * 2); }
 
         std::vector<Slot> slots_;
         size_t count_ = 0;

@@ -61,6 +61,27 @@ inline uint64_t zrTextHash(std::u16string_view text) noexcept {
     return h ^ (h >> 32);
 }
 
+// Linear probing for the open-addressing tables of names and positions. Each Slot
+// has a `hash` and says whether it is free(); a table's size is a power of two and
+// always has a free slot.
+template <class Slot> void zrPlaceSlot(std::vector<Slot>& slots, Slot&& slot) {
+    const size_t mask = slots.size() - 1;
+    size_t i = size_t(slot.hash) & mask;
+    while (!slots[i].free())
+        i = (i + 1) & mask;
+    slots[i] = std::move(slot);
+}
+
+// Moves the held slots into a table of `size` slots.
+template <class Slot> void zrRehashSlots(std::vector<Slot>& slots, size_t size) {
+    std::vector<Slot> old(size);
+    old.swap(slots);
+    for (Slot& slot : old) {
+        if (!slot.free())
+            zrPlaceSlot(slots, std::move(slot));
+    }
+}
+
 class ZrName {
   public:
     ZrName() noexcept = default;
@@ -216,21 +237,10 @@ class ZrNamePool {
     struct Slot {
         uint64_t hash = 0;
         ZrName name; // empty: a free slot
+        bool free() const { return name.empty(); }
     };
 
-    void grow() {
-        std::vector<Slot> old(slots_.empty() ? 256 : slots_.size() * 2);
-        old.swap(slots_);
-        const size_t mask = slots_.size() - 1;
-        for (Slot& slot : old) {
-            if (slot.name.empty())
-                continue;
-            size_t i = slot.hash & mask;
-            while (!slots_[i].name.empty())
-                i = (i + 1) & mask;
-            slots_[i] = std::move(slot);
-        }
-    }
+    void grow() { zrRehashSlots(slots_, slots_.empty() ? 256 : slots_.size() * 2); }
 
     std::vector<Slot> slots_;
     size_t count_ = 0;
@@ -255,12 +265,12 @@ class ZrTextSet {
         }
         if (slots_.empty()) {
             slots_.resize(4 * kInPlace);
-            for (const Slot& held : inPlace_)
-                place(held);
+            for (Slot held : inPlace_)
+                zrPlaceSlot(slots_, std::move(held));
         } else if ((count_ + 1) * 4 > slots_.size() * 3) {
-            grow();
+            zrRehashSlots(slots_, slots_.size() * 2);
         }
-        place(slot);
+        zrPlaceSlot(slots_, Slot(slot));
         ++count_;
     }
 
@@ -274,6 +284,7 @@ class ZrTextSet {
         uint64_t hash = 0;
         const char16_t* data = nullptr; // null: a free slot
         size_t size = 0;
+        bool free() const { return data == nullptr; }
     };
 
     static constexpr size_t kInPlace = 8;
@@ -297,23 +308,6 @@ class ZrTextSet {
                 return false;
             if (holds(slot, hash, text))
                 return true;
-        }
-    }
-
-    void place(const Slot& slot) {
-        const size_t mask = slots_.size() - 1;
-        size_t i = slot.hash & mask;
-        while (slots_[i].data)
-            i = (i + 1) & mask;
-        slots_[i] = slot;
-    }
-
-    void grow() {
-        std::vector<Slot> old(slots_.size() * 2);
-        old.swap(slots_);
-        for (const Slot& slot : old) {
-            if (slot.data)
-                place(slot);
         }
     }
 
