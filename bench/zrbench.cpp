@@ -3,12 +3,16 @@
 //
 // For each generated size (and each schema named with --schema) it measures in one
 // process: the floor, a SAX parser configured exactly as a read configures it, with
-// a handler that does nothing but follow includes; the read, ZrXmlSchemaDict's
-// whole ReadDictionary including the copy of the records into the dictionary; and
-// the peak of live heap bytes during one read, counted by the allocation functions
-// this program replaces (the parser allocates through them too).
+// a handler that does nothing but follow includes; the kept floor, the same parser
+// with a handler that also does the least any reader that resolves references by
+// name must do (below); the host's share, the read's records made again through the
+// host's API alone; the read, ZrXmlSchemaDict's whole ReadDictionary including the
+// copy of the records into the dictionary; and the peak of live heap bytes during
+// one read, counted by the allocation functions this program replaces (the parser
+// allocates through them too).
 #include "ParserConfig.h"
 #include "SchemaGenerator.h"
+#include "ZrName.h"
 #include "ZrXmlSchemaDict.h"
 #include "zrglob.h"
 
@@ -24,6 +28,7 @@
 #include <filesystem>
 #include <malloc.h>
 #include <map>
+#include <memory>
 #include <new>
 #include <optional>
 #include <set>
@@ -218,12 +223,70 @@ class FloorHandler : public HandlerBase {
     }
 };
 
+// The least a reader that resolves references by name adds to the parse, as a
+// reference point between the floor and the read: every attribute value is kept, in
+// one growing buffer, and each value that names a component or refers to one (name,
+// type, ref, base) is entered once in a table of distinct texts. No dispatch, no
+// model, no records: any reader of this design does at least this much.
+class KeepingHandler : public FloorHandler {
+  public:
+    void startElement(const XMLCh* name, AttributeList& attrs) override {
+        FloorHandler::startElement(name, attrs);
+        for (XMLSize_t i = 0, n = attrs.getLength(); i < n; ++i) {
+            const size_t offset = kept_.size();
+            kept_.append(attrs.getValue(i));
+            if (namesComponent(attrs.getName(i)))
+                enter(offset, kept_.size() - offset);
+        }
+    }
+
+  private:
+    struct Slot {
+        uint64_t hash = 0;
+        size_t offset = 0;
+        size_t size = 0; // 0: a free slot (empty texts are not entered)
+        bool free() const { return size == 0; }
+    };
+
+    static bool namesComponent(const XMLCh* attribute) {
+        return XMLString::equals(attribute, u"name") || XMLString::equals(attribute, u"type") ||
+               XMLString::equals(attribute, u"ref") || XMLString::equals(attribute, u"base");
+    }
+
+    std::u16string_view text(size_t offset, size_t size) const {
+        return std::u16string_view(kept_).substr(offset, size);
+    }
+
+    void enter(size_t offset, size_t size) {
+        if (size == 0)
+            return;
+        if ((entered_ + 1) * 4 > slots_.size() * 3)
+            zrRehashSlots(slots_, slots_.empty() ? 256 : slots_.size() * 2);
+        const std::u16string_view value = text(offset, size);
+        const uint64_t hash = zrTextHash(value);
+        const size_t mask = slots_.size() - 1;
+        for (size_t i = hash & mask; !slots_[i].free(); i = (i + 1) & mask) {
+            if (slots_[i].hash == hash && zrSameText(text(slots_[i].offset, slots_[i].size), value))
+                return;
+        }
+        zrPlaceSlot(slots_, Slot{hash, offset, size});
+        ++entered_;
+    }
+
+    std::u16string kept_;
+    std::vector<Slot> slots_;
+    size_t entered_ = 0;
+};
+
 // Parses `mainPath` and every document it includes, once each, in the reader's
-// order. Returns the documents parsed; throws when one of them fails.
-std::vector<std::string> runFloor(const std::string& mainPath) {
+// order, with the floor's handler or the keeping one. Returns the documents parsed;
+// throws when one of them fails.
+std::vector<std::string> runFloor(const std::string& mainPath, bool keeping = false) {
     // The reader's own parser class: the same configuration and the same DTD hooks.
     SchemaParser parser;
-    FloorHandler handler;
+    FloorHandler plain;
+    KeepingHandler keeper;
+    FloorHandler& handler = keeping ? keeper : plain;
     parser.setDocumentHandler(&handler);
     parser.setErrorHandler(&handler);
 
@@ -300,6 +363,23 @@ ReadOutcome measuredRead(const std::string& mainPath, bool qualified) {
     return out;
 }
 
+// Each record of `from` made again in `to` the way a reader hands its records over:
+// one record, then one call per field with the field's type and a name of its own.
+void remakeRecords(const ZrRecordList& from, ZrRecordList& to) {
+    for (int i = 0; i < from.Count(); ++i) {
+        const ZrRecord* record = from[i];
+        ZrRecord* made = to.AddRecord(nullptr, -1);
+        if (!made)
+            throw std::bad_alloc();
+        made->name = record->name;
+        made->RecordLength(record->RecordLength());
+        for (int f = 0; f < record->FieldCount(); ++f) {
+            const ZrField* field = record->GetFieldbyPos(f);
+            made->NewField(field->DataType(), ZrWString(field->FieldName()));
+        }
+    }
+}
+
 // --- one schema set -------------------------------------------------------------------
 
 struct SetResult {
@@ -309,6 +389,8 @@ struct SetResult {
     uint64_t textBytes = 0;
     ReadOutcome read;
     double floorSeconds = 0;
+    double keptSeconds = 0;
+    double hostSeconds = 0;
     double readSeconds = 0;
     double maxRssMB = 0;
     bool timed = false;
@@ -372,6 +454,8 @@ int defaultRepetitions(uint64_t textBytes) {
 
 void timeSet(SetResult& set, bool qualified, int repetitions, CollectingReporter& reporter) {
     const std::string floorName = "floor/" + set.label;
+    const std::string keptName = "kept/" + set.label;
+    const std::string hostName = "host/" + set.label;
     const std::string readName = "read/" + set.label;
     const std::string mainPath = set.documents.front();
     const int reps = repetitions > 0 ? repetitions : defaultRepetitions(set.textBytes);
@@ -387,6 +471,29 @@ void timeSet(SetResult& set, bool qualified, int repetitions, CollectingReporter
         for (auto _ : state) {
             const double start = now();
             runFloor(mainPath);
+            state.SetIterationTime(now() - start);
+        }
+    }));
+    configure(benchmark::RegisterBenchmark(keptName.c_str(), [mainPath](benchmark::State& state) {
+        for (auto _ : state) {
+            const double start = now();
+            runFloor(mainPath, true);
+            state.SetIterationTime(now() - start);
+        }
+    }));
+    // The records of one read, made again through the host's API into a fresh list
+    // (its release untimed, as with the read's dictionary).
+    auto source = std::make_shared<ZrXmlSchemaDict>(nullptr);
+    {
+        MessageSink sink;
+        source->QualifiedRecords(qualified);
+        source->ReadDictionary(mainPath.c_str());
+    }
+    configure(benchmark::RegisterBenchmark(hostName.c_str(), [source](benchmark::State& state) {
+        for (auto _ : state) {
+            ZrRecordList made;
+            const double start = now();
+            remakeRecords(source->RecordList(), made);
             state.SetIterationTime(now() - start);
         }
     }));
@@ -407,9 +514,12 @@ void timeSet(SetResult& set, bool qualified, int repetitions, CollectingReporter
         }));
     benchmark::RunSpecifiedBenchmarks(&reporter);
     benchmark::ClearRegisteredBenchmarks();
-    set.timed = minimumSeconds.count(floorName) && minimumSeconds.count(readName);
+    set.timed = minimumSeconds.count(floorName) && minimumSeconds.count(keptName) &&
+                minimumSeconds.count(hostName) && minimumSeconds.count(readName);
     if (set.timed) {
         set.floorSeconds = minimumSeconds[floorName];
+        set.keptSeconds = minimumSeconds[keptName];
+        set.hostSeconds = minimumSeconds[hostName];
         set.readSeconds = minimumSeconds[readName];
     }
 }
@@ -456,18 +566,20 @@ void printTable(const std::vector<SetResult>& sets) {
         width = std::max(width, static_cast<int>(s.label.size()));
     std::printf("\ntimes: fastest of the repetitions, %s\n",
                 wallClock ? "elapsed time" : "CPU time of the reading thread");
-    std::printf("%-*s %9s %5s %10s %10s %6s %9s %9s %11s %8s %9s\n", width, "set", "text MB",
-                "docs", "floor ms", "read ms", "ratio", "peak MB", "peak/text", "retained MB",
-                "records", "maxrss MB");
+    std::printf("%-*s %9s %5s %10s %10s %9s %10s %6s %6s %9s %9s %11s %8s %9s\n", width, "set",
+                "text MB", "docs", "floor ms", "kept ms", "host ms", "read ms", "least", "ratio",
+                "peak MB", "peak/text", "retained MB", "records", "maxrss MB");
     for (const auto& s : sets) {
         const double text = static_cast<double>(s.textBytes);
         const double peak = static_cast<double>(s.read.peakBytes);
         std::printf("%-*s %9.2f %5zu ", width, s.label.c_str(), text / kMB, s.documents.size());
         if (s.timed)
-            std::printf("%10.2f %10.2f %6.2f ", s.floorSeconds * 1e3, s.readSeconds * 1e3,
+            std::printf("%10.2f %10.2f %9.2f %10.2f %6.2f %6.2f ", s.floorSeconds * 1e3,
+                        s.keptSeconds * 1e3, s.hostSeconds * 1e3, s.readSeconds * 1e3,
+                        (s.keptSeconds + s.hostSeconds) / s.floorSeconds,
                         s.readSeconds / s.floorSeconds);
         else
-            std::printf("%10s %10s %6s ", "-", "-", "-");
+            std::printf("%10s %10s %9s %10s %6s %6s ", "-", "-", "-", "-", "-", "-");
         std::printf("%9.1f %9.2f %11.1f %8d %9.1f\n", peak / kMB, peak / text,
                     static_cast<double>(s.read.retainedBytes) / kMB, s.read.records, s.maxRssMB);
     }
@@ -490,8 +602,10 @@ void printTable(const std::vector<SetResult>& sets) {
                         s.readSeconds <= 1.25 * s.floorSeconds ? "met" : "MISSED");
     if (at10k && at100k && at100k->timed) {
         const double growth = at100k->readSeconds / at10k->readSeconds;
-        std::printf("growth read(100000)/read(10000)      %6.2f  %s\n", growth,
-                    growth <= 11.0 ? "met" : "MISSED");
+        std::printf("growth read(100000)/read(10000)      %6.2f  %s (floor %.2f, kept %.2f)\n",
+                    growth, growth <= 11.0 ? "met" : "MISSED",
+                    at100k->floorSeconds / at10k->floorSeconds,
+                    at100k->keptSeconds / at10k->keptSeconds);
     }
     if (at100k) {
         const double ratio =
