@@ -224,18 +224,24 @@ class FloorHandler : public HandlerBase {
 };
 
 // The least a reader that resolves references by name adds to the parse, as a
-// reference point between the floor and the read: every attribute value is kept, in
-// one growing buffer, and each value that names a component or refers to one (name,
-// type, ref, base) is entered once in a table of distinct texts. No dispatch, no
-// model, no records: any reader of this design does at least this much.
+// reference point between the floor and the read: the values of the attributes the
+// reader uses are kept, in one growing buffer, and each value that names a component
+// or refers to one (name, type, ref, base) is entered once in a table of distinct
+// texts. Occurrences, "use" and documentation attributes, which the reader ignores,
+// are only looked at. No dispatch, no model, no records: any reader of this design
+// does at least this much.
 class KeepingHandler : public FloorHandler {
   public:
     void startElement(const XMLCh* name, AttributeList& attrs) override {
         FloorHandler::startElement(name, attrs);
         for (XMLSize_t i = 0, n = attrs.getLength(); i < n; ++i) {
+            const XMLCh* attribute = attrs.getName(i);
+            const bool named = namesComponent(attribute);
+            if (!named && !keptAsWritten(attribute))
+                continue;
             const size_t offset = kept_.size();
             kept_.append(attrs.getValue(i));
-            if (namesComponent(attrs.getName(i)))
+            if (named)
                 enter(offset, kept_.size() - offset);
         }
     }
@@ -251,6 +257,14 @@ class KeepingHandler : public FloorHandler {
     static bool namesComponent(const XMLCh* attribute) {
         return XMLString::equals(attribute, u"name") || XMLString::equals(attribute, u"type") ||
                XMLString::equals(attribute, u"ref") || XMLString::equals(attribute, u"base");
+    }
+
+    // Facet values, and the schema's namespace, declarations and included locations.
+    static bool keptAsWritten(const XMLCh* attribute) {
+        return XMLString::equals(attribute, u"value") ||
+               XMLString::equals(attribute, u"targetNamespace") ||
+               XMLString::equals(attribute, u"schemaLocation") ||
+               XMLString::startsWith(attribute, u"xmlns");
     }
 
     std::u16string_view text(size_t offset, size_t size) const {
