@@ -443,8 +443,11 @@ class CollectingReporter : public benchmark::ConsoleReporter {
     void ReportRuns(const std::vector<Run>& runs) override {
         ConsoleReporter::ReportRuns(runs);
         for (const Run& run : runs) {
-            if (run.run_type == Run::RT_Aggregate && run.aggregate_name == "min" &&
-                !run.error_occurred)
+            // A single repetition has no aggregate: its one run is the fastest.
+            const bool fastest = run.run_type == Run::RT_Aggregate
+                                     ? run.aggregate_name == "min"
+                                     : run.repetitions <= 1;
+            if (fastest && !run.error_occurred)
                 minimumSeconds[run.run_name.function_name] =
                     run.GetAdjustedRealTime() / 1e3; // the unit is milliseconds
         }
@@ -569,6 +572,10 @@ bool measureSet(SetResult& set, const std::string& mainPath, bool qualified, boo
     if (timing)
         timeSet(set, qualified, repetitions, reporter);
     set.maxRssMB = maxRssMB();
+    if (timing && !set.timed) {
+        std::fprintf(stderr, "%s: a measurement recorded no time\n", set.label.c_str());
+        return false;
+    }
     return true;
 }
 
