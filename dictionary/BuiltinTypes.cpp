@@ -1,6 +1,6 @@
-// The built-in data types: the fixed list of type-definition strings that every
-// field type comes from, and the browser's lookups into it.
-#include "ZrXmlSchemaBrowser.h"
+#include "BuiltinTypes.h"
+
+#include "zrstring.h"
 
 // The order matters: both lookups answer the first match. Element types first, then
 // their attribute variants (usage + 256). Entries 55 and 56 pair usage 277 with the
@@ -139,47 +139,34 @@ const char* const kBuiltinTypeDefinitions[kBuiltinTypeCount + 1] = {
     nullptr,
 };
 
-void ZrXmlSchemaBrowser::defineBuiltinTypes() {
+BuiltinTypes::BuiltinTypes() {
     int count = 0;
     while (kBuiltinTypeDefinitions[count])
         ++count;
 
-    builtinTypes = std::make_unique<ZrDType[]>(count);
-    builtinTypePointers = std::make_unique<const ZrDType*[]>(count + 1);
-    builtinByAlias.clear();
-    builtinByUsage.clear();
-    builtinByWideAlias.clear();
-    builtinWideAliases.assign(size_t(count), std::u16string());
+    types_ = std::make_unique<ZrDType[]>(count);
+    pointers_ = std::make_unique<const ZrDType*[]>(count + 1);
+    wideAliases_.assign(size_t(count), std::u16string());
     for (int i = 0; i < count; ++i) {
-        builtinTypes[i].Define(kBuiltinTypeDefinitions[i]);
-        builtinTypePointers[i] = &builtinTypes[i];
+        types_[i].Define(kBuiltinTypeDefinitions[i]);
+        pointers_[i] = &types_[i];
         // emplace keeps the earliest entry, which is what a scan in list order finds.
-        builtinByAlias.emplace(builtinTypes[i].Alias(), &builtinTypes[i]);
-        builtinWideAliases[size_t(i)] = zrUtf8ToUtf16(builtinTypes[i].Alias());
-        builtinByWideAlias.emplace(builtinWideAliases[size_t(i)], &builtinTypes[i]);
-        builtinByUsage.emplace(builtinTypes[i].Usage(), &builtinTypes[i]);
+        wideAliases_[size_t(i)] = zrUtf8ToUtf16(types_[i].Alias());
+        byWideAlias_.emplace(wideAliases_[size_t(i)], &types_[i]);
+        byUsage_.emplace(types_[i].Usage(), &types_[i]);
     }
-    builtinTypePointers[count] = nullptr;
-    recordType.Define(kBuiltinTypeDefinitions[2]);
-}
-
-const ZrDType* ZrXmlSchemaBrowser::TypeByName(const XMLCh* name) const {
-    if (!name)
-        return nullptr;
-    ZrString narrow;
-    narrow.Assign(name, ZR_CSET_DEFAULT, -1);
-    auto it = builtinByAlias.find(narrow.str());
-    return it == builtinByAlias.end() ? nullptr : it->second;
+    pointers_[count] = nullptr;
+    recordType_.Define(kBuiltinTypeDefinitions[2]);
 }
 
 // Type names come as wide text; the aliases, compared as UTF-8 bytes, are ASCII, so
 // comparing the wide text gives the same answers without converting every name.
-const ZrDType* ZrXmlSchemaBrowser::builtinByName(std::u16string_view name) const {
-    const auto it = builtinByWideAlias.find(name);
-    return it == builtinByWideAlias.end() ? nullptr : it->second;
+const ZrDType* BuiltinTypes::builtinByName(std::u16string_view name) const {
+    const auto it = byWideAlias_.find(name);
+    return it == byWideAlias_.end() ? nullptr : it->second;
 }
 
-const ZrDType* ZrXmlSchemaBrowser::TypeByUsage(short usage) const {
-    auto it = builtinByUsage.find(usage);
-    return it == builtinByUsage.end() ? nullptr : it->second;
+const ZrDType* BuiltinTypes::TypeByUsage(short usage) const {
+    auto it = byUsage_.find(usage);
+    return it == byUsage_.end() ? nullptr : it->second;
 }

@@ -1,6 +1,5 @@
-// Field typing: from a type name and the facets of the schema's simple types to the
-// host data type of a field.
-#include "ZrXmlSchemaBrowser.h"
+#include "FieldTyping.h"
+
 #include "zrglob.h"
 
 #include <algorithm>
@@ -19,16 +18,16 @@ constexpr int64_t kPatternLengthCap = INT32_MAX;
 // recurses once per open group, and the pattern's author decides how often.
 constexpr int kMaxPatternGroupDepth = 256;
 
-bool isBlank(XMLCh c) {
+bool isBlank(char16_t c) {
     return c == u' ' || c == u'\t' || c == u'\n' || c == u'\v' || c == u'\f' || c == u'\r';
 }
 
-bool isDigit(XMLCh c) { return c >= u'0' && c <= u'9'; }
+bool isDigit(char16_t c) { return c >= u'0' && c <= u'9'; }
 
 // A facet's number as a base-10 integer read like wcstol: leading blanks, an
 // optional sign, the longest run of digits; the rest is ignored ("1e5" is 1, "abc"
 // is 0). Clamped to the 32-bit signed range.
-int64_t facetNumber(const XMLCh* text) {
+int64_t facetNumber(const char16_t* text) {
     if (!text)
         return 0;
     while (isBlank(*text))
@@ -48,7 +47,7 @@ int64_t facetNumber(const XMLCh* text) {
 
 int64_t facetNumber(const ZrName& text) { return facetNumber(text.c_str()); }
 
-bool isEmpty(const XMLCh* text) { return !text || !*text; }
+bool isEmpty(const char16_t* text) { return !text || !*text; }
 
 int decimalDigits(int64_t value) {
     int digits = 1;
@@ -60,7 +59,7 @@ int decimalDigits(int64_t value) {
 }
 
 // A digit run of a quantifier, saturating at the pattern cap.
-int64_t quantifierNumber(const XMLCh*& cursor) {
+int64_t quantifierNumber(const char16_t*& cursor) {
     int64_t value = 0;
     for (; isDigit(*cursor); ++cursor)
         value = std::min(value * 10 + (*cursor - u'0'), kPatternLengthCap);
@@ -77,57 +76,76 @@ bool limitsIgnoredFor(int usage) {
            (usage >= 57 && usage <= 61) || usage == 64 || usage == 65;
 }
 
+long branchLengthAt(const char16_t*& cursor, int groupDepth);
+
 } // namespace
 
-bool ZrXmlSchemaBrowser::lookupType(std::u16string_view localName, std::u16string_view namespaceURI,
-                                    ZrDType& type) {
-    if (findComplexType(localName, namespaceURI)) {
+bool BuildDepth::tooDeep(const char16_t* where) const {
+    if (open <= kMaxBuildDepth)
+        return false;
+    ZrGlob::LogMessage(ZR_SEV_ERROR, 0, "Schema nesting deeper than %d levels at %S",
+                       kMaxBuildDepth, where);
+    return true;
+}
+
+TypeResolver::TypeResolver(const SchemaModel& model, const BuiltinTypes& builtins,
+                           BuildDepth& depth)
+    : model_(model), builtins_(builtins), depth_(depth) {}
+
+bool TypeResolver::lookupType(std::u16string_view localName, std::u16string_view namespaceURI,
+                              ZrDType& type) {
+    if (model_.findComplexType(localName, namespaceURI)) {
         ZrGlob::LogMessage(ZR_SEV_NOTICE, 0, "Oops, lookupType asked to lookup a complex type");
         return false;
     }
     const std::u16string_view name = localName == u"anyType" ? u"string" : localName;
 
-    SimpleTypeDef* simpleType = simpleTypes.find(name, namespaceURI);
+    const SimpleTypeDef* simpleType = model_.simpleTypes.find(name, namespaceURI);
     if (!simpleType) {
         // Built-in aliases answer whatever namespace the name came with.
-        const ZrDType* builtin = builtinByName(name);
+        const ZrDType* builtin = builtins_.builtinByName(name);
         if (!builtin)
             return false;
         type = *builtin;
         return true;
     }
-    if (!resolveSimpleType(*simpleType)) {
-        ZrGlob::LogMessage(ZR_SEV_ERROR, 0, "Error resolving simple type %S",
-                           simpleType->name.c_str());
-        return false;
+    if (const auto kept = resolved_.find(simpleType); kept != resolved_.end()) {
+        type = kept->second;
+        return true;
     }
-    type = simpleType->dataType;
+    ZrDType resolved;
+    if (!typeOfSimpleType(*simpleType, resolved))
+        return false;
+    type = resolved_.emplace(simpleType, resolved).first->second;
     return true;
 }
 
-bool ZrXmlSchemaBrowser::resolveSimpleType(SimpleTypeDef& simpleType) {
-    if (simpleType.resolved)
+bool TypeResolver::typeOfSimpleType(const SimpleTypeDef& simpleType, ZrDType& type) {
+    if (resolveSimpleType(simpleType, type))
         return true;
+    ZrGlob::LogMessage(ZR_SEV_ERROR, 0, "Error resolving simple type %S", simpleType.name.c_str());
+    return false;
+}
+
+bool TypeResolver::resolveSimpleType(const SimpleTypeDef& simpleType, ZrDType& type) {
     // A base chain that comes back to a type still being resolved would never end;
     // the types on the cycle fail instead, each level logging on the way back.
-    if (resolvingTypes.count(&simpleType)) {
+    if (resolving_.count(&simpleType)) {
         ZrGlob::LogMessage(ZR_SEV_ERROR, 0, "Circular base type chain at simple type %S",
                            simpleType.name.c_str());
         return false;
     }
-    ++buildDepth;
+    ++depth_.open;
     bool based = false;
-    if (!nestingTooDeep(simpleType.name.c_str())) {
-        resolvingTypes.insert(&simpleType);
-        based =
-            lookupType(simpleType.baseName.view(), simpleType.baseNs.view(), simpleType.dataType);
-        resolvingTypes.erase(&simpleType);
+    if (!depth_.tooDeep(simpleType.name.c_str())) {
+        resolving_.insert(&simpleType);
+        based = lookupType(simpleType.baseName.view(), simpleType.baseNs.view(), type);
+        resolving_.erase(&simpleType);
     }
-    --buildDepth;
+    --depth_.open;
     if (!based)
         return false;
 
-    ZrDType& type = simpleType.dataType;
     // Later facets override earlier ones: enumeration length beats the length facets
     // and the limits; the pattern's precision beats the limits and the precision facet.
     if (!simpleType.length.empty())
@@ -147,13 +165,11 @@ bool ZrXmlSchemaBrowser::resolveSimpleType(SimpleTypeDef& simpleType) {
         dtPattern(type, simpleType.pattern.c_str());
     if (simpleType.maxEnumLength != 0)
         type.Length(simpleType.maxEnumLength);
-    simpleType.resolved = true;
     return true;
 }
 
-void ZrXmlSchemaBrowser::dtLimits(ZrDType& type, const XMLCh* minInclusive,
-                                  const XMLCh* maxInclusive, const XMLCh* minExclusive,
-                                  const XMLCh* maxExclusive) {
+void dtLimits(ZrDType& type, const char16_t* minInclusive, const char16_t* maxInclusive,
+              const char16_t* minExclusive, const char16_t* maxExclusive) {
     if (limitsIgnoredFor(type.Usage() & ~256))
         return;
     // Magnitudes in 64 bits: the smallest 32-bit value has no 32-bit magnitude.
@@ -174,11 +190,11 @@ void ZrXmlSchemaBrowser::dtLimits(ZrDType& type, const XMLCh* minInclusive,
     type.Length(digits);
 }
 
-void ZrXmlSchemaBrowser::dtPattern(ZrDType& type, const XMLCh* pattern) {
+void dtPattern(ZrDType& type, const char16_t* pattern) {
     if (isEmpty(pattern))
         return;
     long best = 0;
-    const XMLCh* cursor = pattern;
+    const char16_t* cursor = pattern;
     // Every top-level branch consumes at least one character or ends the text, and
     // an unbounded one ends the scan, so this loop always ends.
     do {
@@ -189,13 +205,15 @@ void ZrXmlSchemaBrowser::dtPattern(ZrDType& type, const XMLCh* pattern) {
         type.Precision(best);
 }
 
-long ZrXmlSchemaBrowser::branchLength(const XMLCh*& cursor) { return branchLengthAt(cursor, 0); }
+long branchLength(const char16_t*& cursor) { return branchLengthAt(cursor, 0); }
 
 // The longest match of one alternative, or -1 when unbounded. At the top level
 // (groupDepth 0) a ")" closes nothing and counts as an ordinary character, so that
 // the scan moves on; inside a group it ends the alternative. The cursor never
 // passes the terminator: every step checks for it before moving.
-long ZrXmlSchemaBrowser::branchLengthAt(const XMLCh*& cursor, int groupDepth) {
+namespace {
+
+long branchLengthAt(const char16_t*& cursor, int groupDepth) {
     if (groupDepth > kMaxPatternGroupDepth)
         return -1;
     if (!*cursor)
@@ -282,7 +300,9 @@ long ZrXmlSchemaBrowser::branchLengthAt(const XMLCh*& cursor, int groupDepth) {
     }
 }
 
-long ZrXmlSchemaBrowser::lengthSpec(const XMLCh*& cursor) {
+} // namespace
+
+long lengthSpec(const char16_t*& cursor) {
     int64_t low = 0;
     int64_t high = -1;
     if (isDigit(*cursor))

@@ -1,16 +1,10 @@
-// Record construction: turns the top-level declarations of complex type, and the
-// declarations nested in them, into host records and fields.
-#include "ZrXmlSchemaBrowser.h"
+#include "RecordBuilder.h"
+
 #include "zrglob.h"
 
 #include <string>
 
 namespace {
-
-// Nested records, groups, element references, base types and simple-type bases
-// together may open this many levels. Real schemas stay far below it; the bound keeps
-// the recursion that follows them well inside an 8 MB stack, sanitizers included.
-constexpr int kMaxBuildDepth = 1000;
 
 // Every read may take this many addField and buildRecord steps, plus a number per
 // component of its model. Group references that fan out, and qualified record names
@@ -82,16 +76,27 @@ ZrWString generatedName(int32_t number) {
 
 } // namespace
 
-ZrRecord* ZrXmlSchemaBrowser::buildRecord(const ElementDef& declaration) {
-    // The first record of a read starts from an empty list with no record open.
-    if (recordWorkList.empty() && records.Count() == 0) {
-        buildSteps = 0;
-        buildStepLimit = 0;
-        fieldTypes.clear();
+RecordBuilder::RecordBuilder(const SchemaModel& schema, const BuiltinTypes& types,
+                             ZrRecordList& target, bool qualified)
+    : model(schema), builtins(types), records(target), qualifiedRecords(qualified),
+      prefixes(schema.namespaces), resolver(schema, types, depth), anonCounter(schema.anonCount) {}
+
+bool RecordBuilder::build() {
+    for (const ElementDef& declaration : model.globalElements) {
+        const ComplexTypeDef* type =
+            model.findComplexType(declaration.typeName.view(), declaration.typeNs.view());
+        recordWorkList.clear();
+        openRecordCount = 0;
+        if (type && !buildRecord(declaration))
+            return false;
     }
+    return true;
+}
+
+ZrRecord* RecordBuilder::buildRecord(const ElementDef& declaration) {
     ZrWString qualified = qualifiedName(declaration.nameNs, declaration.name, false);
-    DepthScope depth(buildDepth);
-    if (nestingTooDeep(qualified.c_str()) || !takeBuildStep(qualified.c_str()))
+    DepthScope level(depth.open);
+    if (depth.tooDeep(qualified.c_str()) || !takeBuildStep(qualified.c_str()))
         return nullptr;
 
     // Most records are named by their qualified name alone: no copy is made to look
@@ -119,7 +124,7 @@ ZrRecord* ZrXmlSchemaBrowser::buildRecord(const ElementDef& declaration) {
 
     bool built = false;
     const ComplexTypeDef* type =
-        findComplexType(declaration.typeName.view(), declaration.typeNs.view());
+        model.findComplexType(declaration.typeName.view(), declaration.typeNs.view());
     if (!type) {
         const ZrWString typeText = qualifiedName(declaration.typeNs, declaration.typeName, true);
         ZrGlob::LogMessage(ZR_SEV_ERROR, 4, "Unable to find complex type %S", typeText.c_str());
@@ -137,13 +142,13 @@ ZrRecord* ZrXmlSchemaBrowser::buildRecord(const ElementDef& declaration) {
 
 // Fields are added only to the innermost record under construction; any other record
 // (one a caller hands in directly) is searched.
-bool ZrXmlSchemaBrowser::recordHasField(const ZrRecord* record, const ZrWString& name) const {
+bool RecordBuilder::recordHasField(const ZrRecord* record, const ZrWString& name) const {
     if (openRecordCount != 0 && openRecords[openRecordCount - 1].record == record)
         return openRecords[openRecordCount - 1].fieldNames.contains(name.view());
     return record->GetFieldbyName(name) != nullptr;
 }
 
-void ZrXmlSchemaBrowser::noteField(const ZrRecord* record, const ZrWString& name) {
+void RecordBuilder::noteField(const ZrRecord* record, const ZrWString& name) {
     if (openRecordCount != 0 && openRecords[openRecordCount - 1].record == record)
         openRecords[openRecordCount - 1].fieldNames.insert(name.view());
 }
@@ -151,11 +156,11 @@ void ZrXmlSchemaBrowser::noteField(const ZrRecord* record, const ZrWString& name
 // Draws in what `type` inherits: the text field of simple content, or the whole base
 // chain's declarations, farthest base first, so a type derived in several steps keeps
 // the fields of every base and not only of the nearest one.
-bool ZrXmlSchemaBrowser::addDerivedContent(const ComplexTypeDef& type, const ZrWString& recordName,
-                                           ZrRecord* record) {
+bool RecordBuilder::addDerivedContent(const ComplexTypeDef& type, const ZrWString& recordName,
+                                      ZrRecord* record) {
     if (type.baseName.empty())
         return true;
-    const ComplexTypeDef* base = findComplexType(type.baseName.view(), type.baseNs.view());
+    const ComplexTypeDef* base = model.findComplexType(type.baseName.view(), type.baseNs.view());
     if (type.simpleContent && !(base && !base->isGroup && base->simpleContent)) {
         // Text typed by a simple type. A base that is a complex type without simple
         // content cannot type text, and fails the field in lookupType.
@@ -175,8 +180,8 @@ bool ZrXmlSchemaBrowser::addDerivedContent(const ComplexTypeDef& type, const ZrW
                            base->name.c_str());
         return false;
     }
-    DepthScope depth(buildDepth);
-    if (nestingTooDeep(base->name.c_str()))
+    DepthScope level(depth.open);
+    if (depth.tooDeep(base->name.c_str()))
         return false;
     ExpansionScope expanding(expansionStack, base);
     bool added = addDerivedContent(*base, recordName, record);
@@ -186,31 +191,38 @@ bool ZrXmlSchemaBrowser::addDerivedContent(const ComplexTypeDef& type, const ZrW
 }
 
 // The text of a simple-content type becomes one field named after the record, typed
-// by a temporary simple type: the complex type's own base and facets under a fresh
-// generated name, removed again once the field has its type.
-bool ZrXmlSchemaBrowser::addSimpleContentField(const ComplexTypeDef& type,
-                                               const ZrWString& recordName, ZrRecord* record) {
+// by a simple type of its own: the complex type's base and facets under a fresh
+// generated name, which messages show.
+bool RecordBuilder::addSimpleContentField(const ComplexTypeDef& type, const ZrWString& recordName,
+                                          ZrRecord* record) {
+    if (!takeBuildStep(record->name.c_str()))
+        return false;
     SimpleTypeDef text(static_cast<const SimpleTypeDef&>(type));
-    text.name = generatedName(anonCounter++);
-    simpleTypes.push_back(std::move(text));
-    const ZrName typeName = simpleTypes.back().name;
-    DepthScope temporary(temporaryTypes);
-    if (!addTextField(recordName, typeName, ZrName(), record))
-        return false; // the temporary type stays; the read fails anyway
-    simpleTypes.pop_back();
+    text.name = generatedName(anonCounter++).view();
+    ElementDef declaration;
+    declaration.name = recordName.view();
+    ZrWString field = qualifiedName(declaration.nameNs, declaration.name, false);
+    ZrDType dataType;
+    if (!resolver.typeOfSimpleType(text, dataType)) {
+        ZrGlob::LogMessage(ZR_SEV_ERROR, 0,
+                           lgettext(u"Lookup of type '%s' (ns '%s') failed for field '%s'"),
+                           text.name.c_str(), u"", field.c_str());
+        return false;
+    }
+    newSimpleField(declaration, dataType, std::move(field), record);
     return true;
 }
 
-bool ZrXmlSchemaBrowser::addTextField(const ZrWString& recordName, const ZrName& typeName,
-                                      const ZrName& typeNs, ZrRecord* record) {
+bool RecordBuilder::addTextField(const ZrWString& recordName, const ZrName& typeName,
+                                 const ZrName& typeNs, ZrRecord* record) {
     ElementDef text;
-    text.name = recordName;
+    text.name = recordName.view();
     text.typeName = typeName;
     text.typeNs = typeNs;
     return addField(text, record);
 }
 
-bool ZrXmlSchemaBrowser::addField(const ElementDef& declaration, ZrRecord* record) {
+bool RecordBuilder::addField(const ElementDef& declaration, ZrRecord* record) {
     if (!takeBuildStep(record->name.c_str()))
         return false;
     if (!declaration.refName.empty())
@@ -221,14 +233,14 @@ bool ZrXmlSchemaBrowser::addField(const ElementDef& declaration, ZrRecord* recor
     // Only names that found no complex type are kept as field types, so a kept one
     // spares the complex-type lookup.
     const ZrDType* kept = keptFieldType(declaration);
-    if (!kept && findComplexType(declaration.typeName.view(), declaration.typeNs.view())) {
+    if (!kept && model.findComplexType(declaration.typeName.view(), declaration.typeNs.view())) {
         const ZrRecord* nested = buildRecord(declaration);
         if (!nested)
             return false;
         // A record met again (a recursive type, or a name shared under unqualified
         // record names) gets one field in its parent, not one per occurrence.
         if (!recordHasField(record, nested->name)) {
-            const ZrField* field = record->NewField(recordType, nested->name);
+            const ZrField* field = record->NewField(builtins.recordType(), nested->name);
             noteField(record, field->FieldName());
         }
         return true;
@@ -238,9 +250,9 @@ bool ZrXmlSchemaBrowser::addField(const ElementDef& declaration, ZrRecord* recor
 
 // The global declaration stands in for the reference entirely, its attribute and
 // nullable flags included.
-bool ZrXmlSchemaBrowser::addReference(const ElementDef& reference, ZrRecord* record) {
+bool RecordBuilder::addReference(const ElementDef& reference, ZrRecord* record) {
     const ElementDef* target =
-        globalElements.findExact(reference.refName.view(), reference.refNs.view());
+        model.globalElements.findExact(reference.refName.view(), reference.refNs.view());
     if (!target) {
         ZrGlob::LogMessage(ZR_SEV_ERROR, 0, "Failed to look up ref to %S:%S",
                            reference.refNs.c_str(), reference.refName.c_str());
@@ -251,16 +263,16 @@ bool ZrXmlSchemaBrowser::addReference(const ElementDef& reference, ZrRecord* rec
                            reference.refNs.c_str(), reference.refName.c_str());
         return false;
     }
-    DepthScope depth(buildDepth);
-    if (nestingTooDeep(reference.refName.c_str()))
+    DepthScope level(depth.open);
+    if (depth.tooDeep(reference.refName.c_str()))
         return false;
     ExpansionScope expanding(expansionStack, target);
     return addField(*target, record);
 }
 
-bool ZrXmlSchemaBrowser::addGroup(const ElementDef& reference, ZrRecord* record) {
+bool RecordBuilder::addGroup(const ElementDef& reference, ZrRecord* record) {
     const ComplexTypeDef* group =
-        findComplexType(reference.groupName.view(), reference.groupNs.view());
+        model.findComplexType(reference.groupName.view(), reference.groupNs.view());
     if (!group) {
         ZrGlob::LogMessage(ZR_SEV_ERROR, 4, "Unable to find group %S", reference.groupName.c_str());
         return false;
@@ -270,8 +282,8 @@ bool ZrXmlSchemaBrowser::addGroup(const ElementDef& reference, ZrRecord* record)
                            reference.groupName.c_str());
         return false;
     }
-    DepthScope depth(buildDepth);
-    if (nestingTooDeep(reference.groupName.c_str()))
+    DepthScope level(depth.open);
+    if (depth.tooDeep(reference.groupName.c_str()))
         return false;
     ExpansionScope expanding(expansionStack, group);
     for (const ElementDef& entry : group->content) {
@@ -281,76 +293,63 @@ bool ZrXmlSchemaBrowser::addGroup(const ElementDef& reference, ZrRecord* record)
     return true;
 }
 
-bool ZrXmlSchemaBrowser::addSimpleField(const ElementDef& declaration, ZrRecord* record,
-                                        const ZrDType* kept) {
+bool RecordBuilder::addSimpleField(const ElementDef& declaration, ZrRecord* record,
+                                   const ZrDType* kept) {
     ZrWString field = qualifiedName(declaration.nameNs, declaration.name, false);
     ZrDType type;
     if (kept)
         type = *kept;
     else if (!fieldType(declaration, field, type))
         return false;
+    newSimpleField(declaration, type, std::move(field), record);
+    return true;
+}
+
+void RecordBuilder::newSimpleField(const ElementDef& declaration, ZrDType type, ZrWString field,
+                                   ZrRecord* record) {
     if (declaration.isAttribute) {
         // Only usage and alias change; a type without an attribute variant keeps its alias.
         const short usage = short(type.Usage() + 256);
         type.Usage(usage);
-        if (const ZrDType* variant = TypeByUsage(usage))
+        if (const ZrDType* variant = builtins.TypeByUsage(usage))
             type.Alias(variant->Alias());
     }
     type.Nulls(declaration.nullable);
     // The host's NewField fails only by throwing bad_alloc, so its result needs no test.
     const ZrField* added = record->NewField(type, std::move(field));
     noteField(record, added->FieldName());
-    return true;
 }
 
 // The data type of a field declared with the declaration's type name, before its
 // attribute and nullable flags. A type found once is kept: with the model complete,
-// lookups of one name give one answer for the rest of the build. Only a temporary
-// type of simple content, which may share an "anon" name and exists for one lookup,
-// could change an answer, so nothing found while one exists is kept. Failures are
-// looked up again, so each says why.
-bool ZrXmlSchemaBrowser::fieldType(const ElementDef& declaration, const ZrWString& field,
-                                   ZrDType& type) {
-    // The type name goes through its text form and back, as a prefixed name would.
-    // The buffers are members, reused field after field: nothing below builds a
-    // field, so they are not overwritten before the failure message names them.
-    ZrWString& typeText = fieldTypeText;
-    typeText = declaration.typeName.view();
-    if (const XMLCh* prefix = ReverseNamespace(declaration.typeNs.c_str(), true);
-        prefix && *prefix) {
-        typeText = std::u16string_view(prefix);
-        typeText += u':';
-        typeText += declaration.typeName.view();
-    }
-    ZrName& local = fieldTypeLocal;
-    ZrName& ns = fieldTypeNs;
-    parseName(typeText.c_str(), true, local, ns);
-    if (local.empty())
-        local = u"string";
-
-    if (!lookupType(local.view(), ns.view(), type)) {
+// lookups of one name give one answer for the rest of the build. Failures are looked
+// up again, so each says why.
+bool RecordBuilder::fieldType(const ElementDef& declaration, const ZrWString& field,
+                              ZrDType& type) {
+    const std::u16string_view local =
+        declaration.typeName.empty() ? u"string" : declaration.typeName.view();
+    if (!resolver.lookupType(local, declaration.typeNs.view(), type)) {
+        const ZrWString localText(local);
         ZrGlob::LogMessage(ZR_SEV_ERROR, 0,
                            lgettext(u"Lookup of type '%s' (ns '%s') failed for field '%s'"),
-                           local.c_str(), ns.c_str(), field.c_str());
+                           localText.c_str(), declaration.typeNs.c_str(), field.c_str());
         return false;
     }
-    if (temporaryTypes == 0)
-        fieldTypes.emplace(
-            FieldTypeKey{declaration.typeName.identity(), declaration.typeNs.identity()},
-            FieldTypeEntry{declaration.typeName, declaration.typeNs, type});
+    fieldTypes.emplace(FieldTypeKey{declaration.typeName.identity(), declaration.typeNs.identity()},
+                       FieldTypeEntry{declaration.typeName, declaration.typeNs, type});
     return true;
 }
 
-const ZrDType* ZrXmlSchemaBrowser::keptFieldType(const ElementDef& declaration) const {
+const ZrDType* RecordBuilder::keptFieldType(const ElementDef& declaration) const {
     const auto it = fieldTypes.find(
         FieldTypeKey{declaration.typeName.identity(), declaration.typeNs.identity()});
     return it == fieldTypes.end() ? nullptr : &it->second.type;
 }
 
-ZrWString ZrXmlSchemaBrowser::qualifiedName(const ZrName& ns, const ZrName& local,
-                                            bool useTargetPrefix) {
-    const XMLCh* prefix = ReverseNamespace(ns.c_str(), useTargetPrefix);
-    if (!prefix || !*prefix)
+ZrWString RecordBuilder::qualifiedName(const ZrName& ns, const ZrName& local,
+                                       bool useTargetPrefix) const {
+    const std::u16string_view prefix = prefixes.prefixOf(ns.view(), useTargetPrefix);
+    if (prefix.empty())
         return ZrWString(local.view());
     ZrWString name(prefix);
     name += u':';
@@ -361,7 +360,7 @@ ZrWString ZrXmlSchemaBrowser::qualifiedName(const ZrName& ns, const ZrName& loca
 // With qualified record names, a record nested two or more levels deep carries the
 // path of the records around it, the outermost left out: [item!detail]note. A name
 // already on that path stands alone, which ends the path of a recursive type.
-ZrWString ZrXmlSchemaBrowser::recordName(const ZrWString& qualified) const {
+ZrWString RecordBuilder::recordName(const ZrWString& qualified) const {
     if (!qualifiedRecords || recordWorkList.size() <= 1)
         return qualified;
     ZrWString name(u"[");
@@ -378,7 +377,7 @@ ZrWString ZrXmlSchemaBrowser::recordName(const ZrWString& qualified) const {
     return name;
 }
 
-bool ZrXmlSchemaBrowser::isExpanding(const void* component) const {
+bool RecordBuilder::isExpanding(const void* component) const {
     for (size_t i = expansionFloor; i < expansionStack.size(); ++i) {
         if (expansionStack[i] == component)
             return true;
@@ -386,15 +385,7 @@ bool ZrXmlSchemaBrowser::isExpanding(const void* component) const {
     return false;
 }
 
-bool ZrXmlSchemaBrowser::nestingTooDeep(const XMLCh* where) {
-    if (buildDepth <= kMaxBuildDepth)
-        return false;
-    ZrGlob::LogMessage(ZR_SEV_ERROR, 0, "Schema nesting deeper than %d levels at %S",
-                       kMaxBuildDepth, where);
-    return true;
-}
-
-bool ZrXmlSchemaBrowser::takeBuildStep(const XMLCh* where) {
+bool RecordBuilder::takeBuildStep(const char16_t* where) {
     if (buildStepLimit == 0)
         buildStepLimit = buildStepBudget();
     if (++buildSteps <= buildStepLimit)
@@ -406,9 +397,9 @@ bool ZrXmlSchemaBrowser::takeBuildStep(const XMLCh* where) {
     return false;
 }
 
-long ZrXmlSchemaBrowser::buildStepBudget() const {
-    long components = long(globalElements.size() + simpleTypes.size());
-    for (const ComplexTypeDef& type : complexTypes)
+long RecordBuilder::buildStepBudget() const {
+    long components = long(model.globalElements.size() + model.simpleTypes.size());
+    for (const ComplexTypeDef& type : model.complexTypes)
         components += 1 + long(type.content.size());
     return kBuildStepFloor + kBuildStepsPerComponent * components;
 }

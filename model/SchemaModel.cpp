@@ -30,7 +30,6 @@ void SimpleTypeDef::clear() {
     encoding.clear();
     period.clear();
     duration.clear();
-    resolved = false;
     maxEnumLength = 0;
 }
 
@@ -39,4 +38,27 @@ void ComplexTypeDef::clear() {
     isGroup = false;
     simpleContent = false;
     SimpleTypeDef::clear();
+}
+
+PrefixWriter::PrefixWriter(const NamespaceBindings& bindings) : bindings_(bindings) {
+    for (const auto& [prefix, bound] : bindings.prefixes)
+        prefixOfUri_.emplace(bound, prefix); // keeps the first in table order
+}
+
+std::u16string_view PrefixWriter::prefixOf(std::u16string_view uri, bool useTargetPrefix) const {
+    if (useTargetPrefix && zrSameText(bindings_.targetNamespace, uri))
+        return kTargetPrefix;
+    if (zrSameText(bindings_.defaultNamespace, uri) || zrSameText(bindings_.targetNamespace, uri))
+        return {};
+    const auto it = prefixOfUri_.find(uri);
+    return it == prefixOfUri_.end() ? std::u16string_view() : it->second;
+}
+
+void SchemaModel::clear() {
+    globalElements.clear();
+    complexTypes.clear();
+    simpleTypes.clear();
+    namespaces.clear();
+    anonCount = 0;
+    names.clear();
 }

@@ -1,14 +1,16 @@
 // The schema component model: plain values filled while a schema is parsed and read
 // when records are built. Components refer to each other only by (local name,
-// namespace) pairs.
+// namespace) pairs. The model knows nothing of how it was read or what is built
+// from it.
 #pragma once
 
 #include "ZrName.h"
-#include "zrdtype.h"
-#include "zrstring.h"
 
 #include <cstdint>
 #include <deque>
+#include <functional>
+#include <map>
+#include <string>
 #include <string_view>
 #include <unordered_map>
 #include <vector>
@@ -17,7 +19,7 @@
 // reference to a group. Kind, in the order record building tests it: refName set
 // (element reference), else groupName set (group reference), else a declaration.
 class ElementDef {
-public:
+  public:
     ZrName typeName;
     ZrName typeNs;
     ZrName name;
@@ -36,9 +38,7 @@ public:
 
 // One simple type with its base and facets (facet values as written).
 class SimpleTypeDef {
-public:
-    bool resolved = false;
-    ZrDType dataType;
+  public:
     ZrName name;
     ZrName nameNs;
     ZrName baseName;
@@ -56,8 +56,6 @@ public:
     ZrName encoding;
     ZrName period;
     ZrName duration;
-    ZrName facetAttrName;
-    ZrName facetAttrValue;
     int32_t maxEnumLength = 0;
 
     SimpleTypeDef() = default;
@@ -67,14 +65,13 @@ public:
     SimpleTypeDef& operator=(SimpleTypeDef&&) noexcept = default;
     virtual ~SimpleTypeDef() = default;
 
-    // Empties name to duration and resets resolved and maxEnumLength; dataType and
-    // the two facet scratch strings are left as they are.
+    // Empties every name and facet and resets maxEnumLength.
     virtual void clear();
 };
 
 // One complex type, or one group or attribute-group definition (isGroup).
 class ComplexTypeDef : public SimpleTypeDef {
-public:
+  public:
     std::vector<ElementDef> content;
     bool isGroup = false;
     bool simpleContent = false;
@@ -101,7 +98,7 @@ inline bool isAnonName(std::u16string_view name) {
 // positions only and compare against the entries themselves, so a lookup allocates
 // nothing; an entry's name must not change while it is in the list.
 template <class T> class NamedList {
-public:
+  public:
     using iterator = typename std::deque<T>::iterator;
     using const_iterator = typename std::deque<T>::const_iterator;
 
@@ -109,45 +106,53 @@ public:
         items_.push_back(item);
         indexLast();
     }
+
     void push_back(T&& item) {
         items_.push_back(std::move(item));
         indexLast();
     }
-    // Removes the last entry and its index entries.
-    void pop_back() {
-        const size_t last = items_.size() - 1;
-        const T& item = items_.back();
-        byQName_.erase(qhash(item.name.view(), item.nameNs.view()), last);
-        if (isAnonName(item.name.view()))
-            byName_.erase(nhash(item.name.view()), last);
-        items_.pop_back();
-    }
+
     void clear() {
         items_.clear();
         byQName_.clear();
         byName_.clear();
     }
+
     size_t size() const { return items_.size(); }
+
     bool empty() const { return items_.empty(); }
+
     T& operator[](size_t i) { return items_[i]; }
+
     const T& operator[](size_t i) const { return items_[i]; }
+
     T& back() { return items_.back(); }
+
+    const T& back() const { return items_.back(); }
+
     iterator begin() { return items_.begin(); }
+
     iterator end() { return items_.end(); }
+
     const_iterator begin() const { return items_.begin(); }
+
     const_iterator end() const { return items_.end(); }
 
     // First entry whose name equals `name` and, unless `name` begins with "anon",
     // whose nameNs equals `ns`; null when none.
     T* find(std::u16string_view name, std::u16string_view ns) {
         if (isAnonName(name)) {
-            const size_t pos = byName_.find(nhash(name), [&](size_t at) {
-                return zrSameText(items_[at].name.view(), name);
-            });
+            const size_t pos = byName_.find(
+                nhash(name), [&](size_t at) { return zrSameText(items_[at].name.view(), name); });
             return pos == npos ? nullptr : &items_[pos];
         }
         return findExact(name, ns);
     }
+
+    const T* find(std::u16string_view name, std::u16string_view ns) const {
+        return const_cast<NamedList*>(this)->find(name, ns);
+    }
+
     // First entry whose name and nameNs equal `name` and `ns`; null when none.
     T* findExact(std::u16string_view name, std::u16string_view ns) {
         const size_t pos = byQName_.find(qhash(name, ns), [&](size_t at) {
@@ -157,13 +162,17 @@ public:
         return pos == npos ? nullptr : &items_[pos];
     }
 
-private:
+    const T* findExact(std::u16string_view name, std::u16string_view ns) const {
+        return const_cast<NamedList*>(this)->findExact(name, ns);
+    }
+
+  private:
     static constexpr size_t npos = static_cast<size_t>(-1);
 
     // Open addressing with linear probing over (hash, position) slots. Only the
     // first position of each key is held: later equal entries are never answers.
     class PositionIndex {
-    public:
+      public:
         template <class Eq> size_t find(size_t hash, Eq&& matches) const {
             if (slots_.empty())
                 return npos;
@@ -176,6 +185,7 @@ private:
                     return slot.pos;
             }
         }
+
         // Adds `pos` under `hash` unless an entry that matches is held already.
         template <class Eq> void insertFirst(size_t hash, size_t pos, Eq&& matches) {
             if ((count_ + 1) * 4 > slots_.size() * 3)
@@ -192,6 +202,7 @@ private:
                     return;
             }
         }
+
         // Removes the slot holding exactly `pos`, if any; backward-shift deletion
         // keeps every remaining key reachable from its home slot.
         void erase(size_t hash, size_t pos) {
@@ -209,7 +220,8 @@ private:
             for (size_t j = (hole + 1) & mask; slots_[j].pos != npos; j = (j + 1) & mask) {
                 const size_t home = slots_[j].hash & mask;
                 // Moves j into the hole unless its home lies cyclically in (hole, j].
-                const bool stays = hole <= j ? (home > hole && home <= j) : (home > hole || home <= j);
+                const bool stays =
+                    hole <= j ? (home > hole && home <= j) : (home > hole || home <= j);
                 if (!stays) {
                     slots_[hole] = slots_[j];
                     hole = j;
@@ -218,15 +230,17 @@ private:
             slots_[hole].pos = npos;
             --count_;
         }
+
         void clear() {
             slots_.clear();
             count_ = 0;
         }
 
-    private:
+      private:
         struct Slot {
             size_t hash = 0;
             size_t pos = npos;
+
             bool free() const { return pos == npos; }
         };
 
@@ -237,10 +251,12 @@ private:
     };
 
     static size_t nhash(std::u16string_view name) { return size_t(zrTextHash(name)); }
+
     static size_t qhash(std::u16string_view name, std::u16string_view ns) {
         const size_t h = nhash(name);
         return h ^ (nhash(ns) + 0x9e3779b97f4a7c15ull + (h << 6) + (h >> 2));
     }
+
     void indexLast() {
         const size_t last = items_.size() - 1;
         const T& item = items_.back();
@@ -257,4 +273,58 @@ private:
     std::deque<T> items_;
     PositionIndex byQName_; // (name, namespace) -> first position
     PositionIndex byName_;  // names beginning with "anon" -> first position
+};
+
+// Stands for the target namespace in names written back as text, even when the
+// schema binds no prefix to it.
+inline constexpr std::u16string_view kTargetPrefix = u"zrxxxtrg";
+
+// The namespace declarations in force: the default and target namespaces and the
+// prefixes bound to namespaces. Documents add to them as they are read.
+struct NamespaceBindings {
+    std::u16string defaultNamespace;
+    std::u16string targetNamespace;
+    std::map<std::u16string, std::u16string, std::less<>> prefixes;
+
+    void clear() {
+        defaultNamespace.clear();
+        targetNamespace.clear();
+        prefixes.clear();
+    }
+};
+
+// How a namespace is written in front of a name: for each namespace, the prefix a
+// name of it carries. Built once over bindings that no longer change, so that a
+// schema binding thousands of prefixes costs no scan per name written.
+class PrefixWriter {
+  public:
+    explicit PrefixWriter(const NamespaceBindings& bindings);
+
+    // The prefix of names in `uri`: kTargetPrefix for the target namespace when
+    // `useTargetPrefix`, none for the default or target namespace, else the first
+    // prefix in table order bound to it, none when no prefix is.
+    std::u16string_view prefixOf(std::u16string_view uri, bool useTargetPrefix) const;
+
+  private:
+    const NamespaceBindings& bindings_;
+    std::unordered_map<std::u16string_view, std::u16string_view> prefixOfUri_;
+};
+
+// Everything one read learns from a schema and the documents it includes.
+struct SchemaModel {
+    NamedList<ElementDef> globalElements;
+    NamedList<ComplexTypeDef> complexTypes;
+    NamedList<SimpleTypeDef> simpleTypes;
+    NamespaceBindings namespaces;
+    // Generated names ("anonN") handed out so far.
+    int32_t anonCount = 0;
+    // One shared copy of each name, namespace and facet value the model holds.
+    ZrNamePool names;
+
+    void clear();
+
+    const ComplexTypeDef* findComplexType(std::u16string_view localName,
+                                          std::u16string_view namespaceURI) const {
+        return complexTypes.find(localName, namespaceURI);
+    }
 };

@@ -5,8 +5,6 @@
 // heap block per repetition.
 #pragma once
 
-#include "zrstring.h"
-
 #include <chrono>
 #include <cstddef>
 #include <cstdint>
@@ -95,8 +93,6 @@ class ZrName {
     ZrName(const char16_t* text)
         : rep_(make(text ? std::u16string_view(text) : std::u16string_view())) {}
 
-    ZrName(const ZrWString& text) : rep_(make(text.view())) {}
-
     ~ZrName() { release(); }
 
     ZrName& operator=(const ZrName& other) noexcept {
@@ -114,8 +110,6 @@ class ZrName {
     ZrName& operator=(std::u16string_view text) { return *this = ZrName(text); }
 
     ZrName& operator=(const char16_t* text) { return *this = ZrName(text); }
-
-    ZrName& operator=(const ZrWString& text) { return *this = ZrName(text.view()); }
 
     std::u16string_view view() const noexcept {
         return rep_ ? std::u16string_view(text(rep_), rep_->size) : std::u16string_view();
@@ -158,14 +152,6 @@ class ZrName {
     }
 
     friend bool operator!=(const ZrName& a, const char16_t* b) noexcept { return !(a == b); }
-
-    friend bool operator==(const ZrName& a, const ZrWString& b) noexcept {
-        return a.view() == b.view();
-    }
-
-    friend bool operator!=(const ZrName& a, const ZrWString& b) noexcept {
-        return a.view() != b.view();
-    }
 
   private:
     // The text follows the header in the same block. The count is not atomic: a
@@ -237,6 +223,7 @@ class ZrNamePool {
     struct Slot {
         uint64_t hash = 0;
         ZrName name; // empty: a free slot
+
         bool free() const { return name.empty(); }
     };
 
@@ -284,6 +271,7 @@ class ZrTextSet {
         uint64_t hash = 0;
         const char16_t* data = nullptr; // null: a free slot
         size_t size = 0;
+
         bool free() const { return data == nullptr; }
     };
 

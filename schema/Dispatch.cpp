@@ -1,4 +1,4 @@
-#include "ZrXmlSchemaBrowser.h"
+#include "SchemaReader.h"
 #include "zrglob.h"
 
 #include <string_view>
@@ -41,8 +41,8 @@ template <class Entry, size_t N> class TagIndex {
 
 } // namespace
 
-void ZrXmlSchemaBrowser::startElement(const XMLCh* name, xercesc::AttributeList& attrs) {
-    using Action = void (ZrXmlSchemaBrowser::*)(xercesc::AttributeList&);
+void SchemaReader::startElement(const XMLCh* name, xercesc::AttributeList& attrs) {
+    using Action = void (SchemaReader::*)(xercesc::AttributeList&);
 
     struct StartAction {
         std::u16string_view name;
@@ -53,35 +53,35 @@ void ZrXmlSchemaBrowser::startElement(const XMLCh* name, xercesc::AttributeList&
     // do nothing and their content is dispatched as usual.
     static constexpr StartAction kStartTable[] = {
         {u"schema", nullptr}, // its attributes and namespace are taken above
-        {u"annotation", &ZrXmlSchemaBrowser::skipSubtree},
-        {u"notation", &ZrXmlSchemaBrowser::skipSubtree},
-        {u"documentation", &ZrXmlSchemaBrowser::skipSubtree},
-        {u"element", &ZrXmlSchemaBrowser::doElementTag},
-        {u"attribute", &ZrXmlSchemaBrowser::doAttributeTag},
-        {u"complexType", &ZrXmlSchemaBrowser::doComplexType},
-        {u"group", &ZrXmlSchemaBrowser::doGroup},
-        {u"attributeGroup", &ZrXmlSchemaBrowser::doGroup},
-        {u"simpleType", &ZrXmlSchemaBrowser::doSimpleType},
-        {u"restriction", &ZrXmlSchemaBrowser::doRestriction},
-        {u"list", &ZrXmlSchemaBrowser::doList},
-        {u"include", &ZrXmlSchemaBrowser::doInclude},
-        {u"extension", &ZrXmlSchemaBrowser::doExtension},
-        {u"simpleContent", &ZrXmlSchemaBrowser::doSimpleContent},
-        {u"complexContent", &ZrXmlSchemaBrowser::doComplexContent},
-        {u"minInclusive", &ZrXmlSchemaBrowser::doFacetTag},
-        {u"maxInclusive", &ZrXmlSchemaBrowser::doFacetTag},
-        {u"minExclusive", &ZrXmlSchemaBrowser::doFacetTag},
-        {u"maxExclusive", &ZrXmlSchemaBrowser::doFacetTag},
-        {u"length", &ZrXmlSchemaBrowser::doFacetTag},
-        {u"minLength", &ZrXmlSchemaBrowser::doFacetTag},
-        {u"maxLength", &ZrXmlSchemaBrowser::doFacetTag},
-        {u"pattern", &ZrXmlSchemaBrowser::doFacetTag},
-        {u"precision", &ZrXmlSchemaBrowser::doFacetTag},
-        {u"scale", &ZrXmlSchemaBrowser::doFacetTag},
-        {u"encoding", &ZrXmlSchemaBrowser::doFacetTag},
-        {u"period", &ZrXmlSchemaBrowser::doFacetTag},
-        {u"duration", &ZrXmlSchemaBrowser::doFacetTag},
-        {u"enumeration", &ZrXmlSchemaBrowser::doFacetTag},
+        {u"annotation", &SchemaReader::skipSubtree},
+        {u"notation", &SchemaReader::skipSubtree},
+        {u"documentation", &SchemaReader::skipSubtree},
+        {u"element", &SchemaReader::doElementTag},
+        {u"attribute", &SchemaReader::doAttributeTag},
+        {u"complexType", &SchemaReader::doComplexType},
+        {u"group", &SchemaReader::doGroup},
+        {u"attributeGroup", &SchemaReader::doGroup},
+        {u"simpleType", &SchemaReader::doSimpleType},
+        {u"restriction", &SchemaReader::doRestriction},
+        {u"list", &SchemaReader::doList},
+        {u"include", &SchemaReader::doInclude},
+        {u"extension", &SchemaReader::doExtension},
+        {u"simpleContent", &SchemaReader::doSimpleContent},
+        {u"complexContent", &SchemaReader::doComplexContent},
+        {u"minInclusive", &SchemaReader::doFacetTag},
+        {u"maxInclusive", &SchemaReader::doFacetTag},
+        {u"minExclusive", &SchemaReader::doFacetTag},
+        {u"maxExclusive", &SchemaReader::doFacetTag},
+        {u"length", &SchemaReader::doFacetTag},
+        {u"minLength", &SchemaReader::doFacetTag},
+        {u"maxLength", &SchemaReader::doFacetTag},
+        {u"pattern", &SchemaReader::doFacetTag},
+        {u"precision", &SchemaReader::doFacetTag},
+        {u"scale", &SchemaReader::doFacetTag},
+        {u"encoding", &SchemaReader::doFacetTag},
+        {u"period", &SchemaReader::doFacetTag},
+        {u"duration", &SchemaReader::doFacetTag},
+        {u"enumeration", &SchemaReader::doFacetTag},
     };
     static const TagIndex kStartIndex(kStartTable);
 
@@ -97,13 +97,14 @@ void ZrXmlSchemaBrowser::startElement(const XMLCh* name, xercesc::AttributeList&
     // not kept: copying it for every tag costs more than the comparison.
     const XmlQualifiedName tag(name);
     const std::u16string_view local = tag.local;
-    const ZrWString* uri = tag.prefixed() ? namespaceOfPrefix(tag.prefix) : &defaultNamespace;
+    const std::u16string* uri =
+        tag.prefixed() ? namespaceOfPrefix(tag.prefix) : &model.namespaces.defaultNamespace;
     // The local part ends where the tag's name does, so it stays null-terminated.
     tagLocal = local;
-    const std::u16string_view ns = uri ? uri->view() : std::u16string_view();
+    const std::u16string_view ns = uri ? std::u16string_view(*uri) : std::u16string_view();
     if (local == u"schema")
         schemaNamespace = ns;
-    if (!zrSameText(ns, schemaNamespace.view())) {
+    if (!zrSameText(ns, schemaNamespace)) {
         tagNamespace = ns;
         ZrGlob::LogMessage(ZR_SEV_NOTICE, 0,
                            "Element '%S' not in XMLSchema namespace (is '%S', should be '%S'",
@@ -114,21 +115,19 @@ void ZrXmlSchemaBrowser::startElement(const XMLCh* name, xercesc::AttributeList&
         (this->*entry->act)(attrs);
 }
 
-void ZrXmlSchemaBrowser::endElement(const XMLCh* name) {
+void SchemaReader::endElement(const XMLCh* name) {
     struct EndAction {
         std::u16string_view name;
-        void (ZrXmlSchemaBrowser::*act)();
+        void (SchemaReader::*act)();
     };
 
     static constexpr EndAction kEndTable[] = {
-        {u"element", &ZrXmlSchemaBrowser::finishElement},
-        {u"attribute", &ZrXmlSchemaBrowser::finishElement},
-        {u"complexType", &ZrXmlSchemaBrowser::finishComplexType},
-        {u"simpleType", &ZrXmlSchemaBrowser::finishSimpleType},
-        {u"restriction", &ZrXmlSchemaBrowser::finishRestriction},
-        {u"include", &ZrXmlSchemaBrowser::finishInclude},
-        {u"group", &ZrXmlSchemaBrowser::finishGroup},
-        {u"attributeGroup", &ZrXmlSchemaBrowser::finishGroup},
+        {u"element", &SchemaReader::finishElement},
+        {u"attribute", &SchemaReader::finishElement},
+        {u"complexType", &SchemaReader::finishComplexType},
+        {u"simpleType", &SchemaReader::finishSimpleType},
+        {u"group", &SchemaReader::finishGroup},
+        {u"attributeGroup", &SchemaReader::finishGroup},
     };
     static const TagIndex kEndIndex(kEndTable);
 
@@ -143,32 +142,32 @@ void ZrXmlSchemaBrowser::endElement(const XMLCh* name) {
         (this->*entry->act)();
 }
 
-void ZrXmlSchemaBrowser::skipSubtree(xercesc::AttributeList&) { skipDepth = 1; }
+void SchemaReader::skipSubtree(xercesc::AttributeList&) { skipDepth = 1; }
 
-void ZrXmlSchemaBrowser::doElementTag(xercesc::AttributeList& attrs) { doElement(attrs, false); }
+void SchemaReader::doElementTag(xercesc::AttributeList& attrs) { doElement(attrs, false); }
 
-void ZrXmlSchemaBrowser::doAttributeTag(xercesc::AttributeList& attrs) { doElement(attrs, true); }
+void SchemaReader::doAttributeTag(xercesc::AttributeList& attrs) { doElement(attrs, true); }
 
-void ZrXmlSchemaBrowser::doFacetTag(xercesc::AttributeList& attrs) {
+void SchemaReader::doFacetTag(xercesc::AttributeList& attrs) {
     doFacet(attrs, currentSimpleType, tagLocal.data());
 }
 
-void ZrXmlSchemaBrowser::doSimpleContent(xercesc::AttributeList&) {
+void SchemaReader::doSimpleContent(xercesc::AttributeList&) {
     currentComplexType.simpleContent = true;
 }
 
-void ZrXmlSchemaBrowser::doComplexContent(xercesc::AttributeList&) {
+void SchemaReader::doComplexContent(xercesc::AttributeList&) {
     currentComplexType.simpleContent = false;
 }
 
-bool ZrXmlSchemaBrowser::tooDeep() {
+bool SchemaReader::tooDeep() {
     if (elementStack.size() + complexTypeStack.size() < kMaxOpenComponents)
         return false;
     if (!failed)
         ZrGlob::LogMessage(
             ZR_SEV_ERROR, 4,
             lgettext(u"Schema: Error: Declarations and types nested deeper than %d in file %s"),
-            static_cast<int>(kMaxOpenComponents), documentPath.c_str());
+            static_cast<int>(kMaxOpenComponents), documentPath_.c_str());
     failed = true;
     skipDepth = 1;
     return true;

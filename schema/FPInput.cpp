@@ -1,4 +1,5 @@
-#include "ZrXmlSchemaBrowser.h"
+#include "FPInput.h"
+
 #include "zrglob.h"
 
 #include <algorithm>

@@ -1,23 +1,14 @@
-#include "ZrXmlSchemaBrowser.h"
+#include "SchemaReader.h"
 #include "zrglob.h"
 
 #include <iterator>
 #include <string_view>
 
-namespace {
-
-// Stands for the target namespace in names the reader writes back as text, even
-// when the schema binds no prefix to it.
-constexpr XMLCh kTargetPrefix[] = u"zrxxxtrg";
-constexpr std::u16string_view kTargetPrefixText = kTargetPrefix;
-
-} // namespace
-
 // Only the first element of each document declares namespaces; its declarations
 // apply to its own name too, so they are read before that name is resolved.
-void ZrXmlSchemaBrowser::FirstElementAttrs(xercesc::AttributeList& attrs) {
-    prefixOfUriStale = true;
+void SchemaReader::FirstElementAttrs(xercesc::AttributeList& attrs) {
     recentPrefixesStale = true;
+    NamespaceBindings& bindings = model.namespaces;
     for (XMLSize_t i = 0; i < attrs.getLength(); ++i) {
         ZrXmlUtils::XMLChToWchar(attrs.getName(i), nameBuffer, false);
         ZrXmlUtils::XMLChToWchar(attrs.getValue(i), valueBuffer, false);
@@ -25,11 +16,11 @@ void ZrXmlSchemaBrowser::FirstElementAttrs(xercesc::AttributeList& attrs) {
             // "xmlnsFoo" declares the default namespace as well: only a colon after
             // the five letters introduces a prefix.
             if (nameBuffer.length() > 5 && nameBuffer.view()[5] == u':')
-                namespacePrefixes[ZrWString(nameBuffer.view().substr(6))] = valueBuffer;
+                bindings.prefixes[std::u16string(nameBuffer.view().substr(6))] = valueBuffer.view();
             else
-                defaultNamespace = valueBuffer;
+                bindings.defaultNamespace = valueBuffer.view();
         } else if (nameBuffer.view() == u"targetNamespace") {
-            targetNamespace = valueBuffer;
+            bindings.targetNamespace = valueBuffer.view();
         } else if (nameBuffer.view() == u"elementFormDefault" ||
                    nameBuffer.view() == u"attributeFormDefault" ||
                    nameBuffer.view() == u"version") {
@@ -41,81 +32,56 @@ void ZrXmlSchemaBrowser::FirstElementAttrs(xercesc::AttributeList& attrs) {
     }
 }
 
-void ZrXmlSchemaBrowser::parseName(const XMLCh* name, bool useDefault, ZrName& localPart,
-                                   ZrName& ns) {
+void SchemaReader::parseName(const XMLCh* name, bool useDefault, ZrName& localPart, ZrName& ns) {
     const XmlQualifiedName text(name);
-    const ZrWString* uri = useDefault ? &defaultNamespace : &targetNamespace;
+    const NamespaceBindings& bindings = model.namespaces;
+    const std::u16string* uri = useDefault ? &bindings.defaultNamespace : &bindings.targetNamespace;
     if (text.prefixed())
         uri = namespaceOfPrefix(text.prefix);
     // Both results are taken before either output changes, since the name may be
     // the text of one of them. An unknown prefix leaves no namespace: the empty text.
-    ZrName foundNs = uri ? namespaceName(uri->view()) : ZrName();
-    ZrName foundLocal = names.intern(text.local);
+    ZrName foundNs = uri ? namespaceName(*uri) : ZrName();
+    ZrName foundLocal = model.names.intern(text.local);
     ns = std::move(foundNs);
     localPart = std::move(foundLocal);
 }
 
 // A schema names its few namespaces over and over: the last ones met are compared
 // before the pool is asked.
-ZrName ZrXmlSchemaBrowser::namespaceName(std::u16string_view uri) {
+ZrName SchemaReader::namespaceName(std::u16string_view uri) {
     for (const ZrName& recent : recentNamespaces) {
         if (zrSameText(recent.view(), uri))
             return recent;
     }
-    ZrName name = names.intern(uri);
+    ZrName name = model.names.intern(uri);
     recentNamespaces[nextRecentNamespace] = name;
     nextRecentNamespace = (nextRecentNamespace + 1) % std::size(recentNamespaces);
     return name;
 }
 
-const XMLCh* ZrXmlSchemaBrowser::LookupNamespace(const XMLCh* prefix) {
-    const ZrWString* uri =
-        namespaceOfPrefix(prefix ? std::u16string_view(prefix) : std::u16string_view());
-    return uri ? uri->c_str() : nullptr;
-}
-
 // Runs for nearly every tag and qualified attribute value, which mostly use one or
 // two prefixes: the last answers are kept, and forgotten when the table changes
 // (FirstElementAttrs, or a change in its size).
-const ZrWString* ZrXmlSchemaBrowser::namespaceOfPrefix(std::u16string_view prefix) {
-    if (prefix == kTargetPrefixText)
-        return &targetNamespace;
-    if (recentPrefixesStale || recentPrefixesTableSize != namespacePrefixes.size()) {
+const std::u16string* SchemaReader::namespaceOfPrefix(std::u16string_view prefix) {
+    const NamespaceBindings& bindings = model.namespaces;
+    if (prefix == kTargetPrefix)
+        return &bindings.targetNamespace;
+    if (recentPrefixesStale || recentPrefixesTableSize != bindings.prefixes.size()) {
         for (RecentPrefix& recent : recentPrefixes)
             recent.used = false;
-        recentPrefixesTableSize = namespacePrefixes.size();
+        recentPrefixesTableSize = bindings.prefixes.size();
         recentPrefixesStale = false;
     }
     for (const RecentPrefix& recent : recentPrefixes) {
-        if (recent.used && zrSameText(recent.prefix.view(), prefix))
+        if (recent.used && zrSameText(recent.prefix, prefix))
             return recent.uri;
     }
-    const auto it = namespacePrefixes.find(prefix);
-    const ZrWString* uri = it == namespacePrefixes.end() ? nullptr : &it->second;
+    const auto it = bindings.prefixes.find(prefix);
+    const std::u16string* uri = it == bindings.prefixes.end() ? nullptr : &it->second;
     RecentPrefix& slot = recentPrefixes[nextRecentPrefix];
     nextRecentPrefix = (nextRecentPrefix + 1) % std::size(recentPrefixes);
     slot.prefix = prefix;
     slot.uri = uri;
     slot.used = true;
     return uri;
-}
-
-const XMLCh* ZrXmlSchemaBrowser::ReverseNamespace(const XMLCh* uri, bool useTargetPrefix) {
-    const std::u16string_view text = uri ? std::u16string_view(uri) : std::u16string_view();
-    if (useTargetPrefix && zrSameText(targetNamespace.view(), text))
-        return kTargetPrefix;
-    if (zrSameText(defaultNamespace.view(), text) || zrSameText(targetNamespace.view(), text))
-        return u"";
-    // The table changes only here (FirstElementAttrs) and when a read empties it;
-    // the size check also covers a table filled by other means.
-    if (prefixOfUriStale || prefixOfUriSize != namespacePrefixes.size()) {
-        prefixOfUri.clear();
-        for (const auto& [prefix, bound] : namespacePrefixes)
-            prefixOfUri.emplace(bound, prefix); // keeps the first in table order
-        prefixOfUriSize = namespacePrefixes.size();
-        prefixOfUriStale = false;
-    }
-    prefixKey = text;
-    const auto it = prefixOfUri.find(prefixKey);
-    return it == prefixOfUri.end() ? u"" : it->second.c_str();
 }

@@ -1,8 +1,7 @@
-// Shared helpers of the unit tests: access to the browser's internals, a log
-// capture, temporary schema files.
+// Shared helpers of the unit tests: a log capture, temporary schema files.
 #pragma once
 
-#include "ZrXmlSchemaBrowser.h"
+#include "ZrName.h"
 #include "zrglob.h"
 #include "zrstring.h"
 
@@ -12,74 +11,14 @@
 #include <string>
 #include <vector>
 
-// Opens the browser's private state to tests.
-class ZrXmlSchemaBrowserTestAccess {
-public:
-    explicit ZrXmlSchemaBrowserTestAccess(ZrXmlSchemaBrowser& browser) : b(browser) {}
-
-    // State.
-    bool& initialised() { return b.initialised; }
-    bool& failed() { return b.failed; }
-    ZrWString& initError() { return b.initError; }
-    ElementDef& currentElement() { return b.currentElement; }
-    NamedList<ElementDef>& globalElements() { return b.globalElements; }
-    ComplexTypeDef& currentComplexType() { return b.currentComplexType; }
-    NamedList<ComplexTypeDef>& complexTypes() { return b.complexTypes; }
-    int32_t& anonCounter() { return b.anonCounter; }
-    SimpleTypeDef& currentSimpleType() { return b.currentSimpleType; }
-    NamedList<SimpleTypeDef>& simpleTypes() { return b.simpleTypes; }
-    SimpleTypeDef*& typeTarget() { return b.typeTarget; }
-    ZrWString& defaultNamespace() { return b.defaultNamespace; }
-    ZrWString& targetNamespace() { return b.targetNamespace; }
-    std::map<ZrWString, ZrWString, PrefixOrder>& namespacePrefixes() { return b.namespacePrefixes; }
-    ZrWString& schemaNamespace() { return b.schemaNamespace; }
-    std::vector<ZrWString>& recordWorkList() { return b.recordWorkList; }
-    std::deque<ZrWString>& documentQueue() { return b.documentQueue; }
-    const ZrDType& recordType() { return b.recordType; }
-    const ZrDType* const* builtinTypePointers() { return b.builtinTypePointers.get(); }
-
-    // Operations.
-    void parseName(const XMLCh* name, bool useDefault, ZrName& local, ZrName& ns) {
-        b.parseName(name, useDefault, local, ns);
-    }
-    void parseName(const XMLCh* name, bool useDefault, ZrWString& local, ZrWString& ns) {
-        ZrName localName;
-        ZrName nsName;
-        b.parseName(name, useDefault, localName, nsName);
-        local = localName.view();
-        ns = nsName.view();
-    }
-    const XMLCh* LookupNamespace(const XMLCh* prefix) { return b.LookupNamespace(prefix); }
-    const XMLCh* ReverseNamespace(const XMLCh* uri, bool useTargetPrefix) {
-        return b.ReverseNamespace(uri, useTargetPrefix);
-    }
-    ComplexTypeDef* findComplexType(const XMLCh* local, const XMLCh* ns) {
-        return b.findComplexType(xmlText(local), xmlText(ns));
-    }
-    ZrRecord* buildRecord(const ElementDef& declaration) { return b.buildRecord(declaration); }
-    bool addField(const ElementDef& declaration, ZrRecord* record) {
-        return b.addField(declaration, record);
-    }
-    bool lookupType(const XMLCh* local, const XMLCh* ns, ZrDType& type) {
-        return b.lookupType(xmlText(local), xmlText(ns), type);
-    }
-    void dtLimits(ZrDType& type, const XMLCh* minInc, const XMLCh* maxInc, const XMLCh* minExc,
-                  const XMLCh* maxExc) {
-        b.dtLimits(type, minInc, maxInc, minExc, maxExc);
-    }
-    void dtPattern(ZrDType& type, const XMLCh* pattern) { b.dtPattern(type, pattern); }
-    long branchLength(const XMLCh*& cursor) { return b.branchLength(cursor); }
-    long lengthSpec(const XMLCh*& cursor) { return b.lengthSpec(cursor); }
-
-private:
-    ZrXmlSchemaBrowser& b;
-};
-
 namespace zrtest {
 
 inline std::string utf8(const ZrWString& s) { return zrUtf16ToUtf8(s.view()); }
+
 inline std::string utf8(const ZrName& s) { return zrUtf16ToUtf8(s.view()); }
+
 inline std::string utf8(std::u16string_view s) { return zrUtf16ToUtf8(s); }
+
 inline ZrWString wide(std::string_view s) { return ZrWString(zrUtf8ToUtf16(s)); }
 
 struct LoggedMessage {
@@ -98,14 +37,16 @@ inline std::ostream& operator<<(std::ostream& os, const LoggedMessage& m) {
 
 // Collects every message logged while it lives.
 class LogCapture {
-public:
+  public:
     LogCapture() {
         previous_ = ZrGlob::SetLogSink([this](int severity, int code, const std::u16string& text) {
             messages.push_back({severity, code, zrUtf16ToUtf8(text)});
         });
     }
+
     LogCapture(const LogCapture&) = delete;
     LogCapture& operator=(const LogCapture&) = delete;
+
     ~LogCapture() { ZrGlob::SetLogSink(previous_); }
 
     // All messages as "severity code text" lines, for compact expectations.
@@ -118,30 +59,32 @@ public:
 
     std::vector<LoggedMessage> messages;
 
-private:
+  private:
     ZrLogSink previous_;
 };
 
 // A fresh directory under the system's temporary folder, removed with its content.
 class TempDir {
-public:
+  public:
     TempDir() {
-        std::string pattern =
-            (std::filesystem::temp_directory_path() / "zrtest-XXXXXX").string();
+        std::string pattern = (std::filesystem::temp_directory_path() / "zrtest-XXXXXX").string();
         std::vector<char> buf(pattern.begin(), pattern.end());
         buf.push_back('\0');
         if (!mkdtemp(buf.data()))
             throw std::runtime_error("mkdtemp failed");
         path_ = buf.data();
     }
+
     TempDir(const TempDir&) = delete;
     TempDir& operator=(const TempDir&) = delete;
+
     ~TempDir() {
         std::error_code ec;
         std::filesystem::remove_all(path_, ec);
     }
 
     const std::filesystem::path& path() const { return path_; }
+
     // Writes `content` to `name` (sub-folders are created) and returns its full path.
     std::string write(const std::string& name, const std::string& content) const {
         auto file = path_ / name;
@@ -150,7 +93,7 @@ public:
         return file.string();
     }
 
-private:
+  private:
     std::filesystem::path path_;
 };
 

@@ -2,7 +2,9 @@
 // builds as stable text.
 #pragma once
 
+#include "RecordBuilder.h"
 #include "TestSupport.h"
+#include "ZrXmlSchemaBrowser.h"
 
 #include <string>
 

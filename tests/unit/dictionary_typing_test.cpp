@@ -1,4 +1,5 @@
 // Field typing: pattern lengths, numeric limits, simple-type resolution.
+#include "FieldTyping.h"
 #include "TestSupport.h"
 
 #include <cstdint>
@@ -16,21 +17,29 @@ using zrtest::wide;
 
 constexpr long kUnchanged = 777;
 
+// A model of simple types, and a resolver over it.
+struct Typing {
+    SchemaModel model;
+    BuiltinTypes builtins;
+    BuildDepth depth;
+    TypeResolver resolver{model, builtins, depth};
+};
+
 // A pattern in a buffer of exactly its length plus the terminator, so that the
 // sanitizer catches any read past the end.
-std::unique_ptr<XMLCh[]> exactText(const std::string& text) {
+std::unique_ptr<char16_t[]> exactText(const std::string& text) {
     const std::u16string wideText = zrUtf8ToUtf16(text);
-    auto buffer = std::make_unique<XMLCh[]>(wideText.size() + 1);
+    auto buffer = std::make_unique<char16_t[]>(wideText.size() + 1);
     std::copy(wideText.begin(), wideText.end(), buffer.get());
     buffer[wideText.size()] = 0;
     return buffer;
 }
 
-long patternPrecision(ZrXmlSchemaBrowserTestAccess& access, const std::string& pattern) {
+long patternPrecision(const std::string& pattern) {
     ZrDType type;
     type.Precision(kUnchanged);
     auto text = exactText(pattern);
-    access.dtPattern(type, text.get());
+    dtPattern(type, text.get());
     return type.Precision();
 }
 
@@ -96,9 +105,7 @@ const PatternCase kPatterns[] = {
 class Pattern : public ::testing::TestWithParam<PatternCase> {};
 
 TEST_P(Pattern, Precision) {
-    ZrXmlSchemaBrowser browser;
-    ZrXmlSchemaBrowserTestAccess access(browser);
-    EXPECT_EQ(patternPrecision(access, GetParam().pattern), GetParam().precision);
+    EXPECT_EQ(patternPrecision(GetParam().pattern), GetParam().precision);
 }
 
 INSTANTIATE_TEST_SUITE_P(Dictionary, Pattern, ::testing::ValuesIn(kPatterns),
@@ -111,8 +118,7 @@ struct ScanCase {
 };
 
 TEST(PatternScan, BranchLengthStopsAfterItsBar) {
-    ZrXmlSchemaBrowser browser;
-    ZrXmlSchemaBrowserTestAccess access(browser);
+    Typing access;
     const ScanCase cases[] = {
         {"ab|cdef", 2, 3}, {"", 0, 0},       {"a*b", -1, 1}, {"(x|yy)z", 3, 7},
         {"a\\", 2, 2},     {"\\p{Lu", 1, 5}, {"ab)c", 4, 4}, {"[a-z]{2}|q", 2, 9},
@@ -120,15 +126,14 @@ TEST(PatternScan, BranchLengthStopsAfterItsBar) {
     for (const ScanCase& c : cases) {
         SCOPED_TRACE(c.text);
         auto text = exactText(c.text);
-        const XMLCh* cursor = text.get();
-        EXPECT_EQ(access.branchLength(cursor), c.result);
+        const char16_t* cursor = text.get();
+        EXPECT_EQ(branchLength(cursor), c.result);
         EXPECT_EQ(size_t(cursor - text.get()), c.consumed);
     }
 }
 
 TEST(PatternScan, LengthSpec) {
-    ZrXmlSchemaBrowser browser;
-    ZrXmlSchemaBrowserTestAccess access(browser);
+    Typing access;
     // The cursor starts just past "{".
     const ScanCase cases[] = {
         {"5}", 5, 2},
@@ -146,8 +151,8 @@ TEST(PatternScan, LengthSpec) {
     for (const ScanCase& c : cases) {
         SCOPED_TRACE(c.text);
         auto text = exactText(c.text);
-        const XMLCh* cursor = text.get();
-        EXPECT_EQ(access.lengthSpec(cursor), c.result);
+        const char16_t* cursor = text.get();
+        EXPECT_EQ(lengthSpec(cursor), c.result);
         EXPECT_EQ(size_t(cursor - text.get()), c.consumed);
     }
 }
@@ -155,8 +160,7 @@ TEST(PatternScan, LengthSpec) {
 // Random patterns over the scan's metacharacters: every one ends, never reads past
 // its terminator, and yields either no precision or a saturated positive one.
 TEST(PatternScan, RandomPatternsEndInsideTheirText) {
-    ZrXmlSchemaBrowser browser;
-    ZrXmlSchemaBrowserTestAccess access(browser);
+    Typing access;
     const std::string alphabet = "()[]{}\\|*+?,0123456789pPa";
     std::mt19937 random(20240611);
     for (int round = 0; round < 20000; ++round) {
@@ -164,7 +168,7 @@ TEST(PatternScan, RandomPatternsEndInsideTheirText) {
         for (char& c : pattern)
             c = alphabet[random() % alphabet.size()];
         SCOPED_TRACE(pattern);
-        const long precision = patternPrecision(access, pattern);
+        const long precision = patternPrecision(pattern);
         EXPECT_TRUE(precision == kUnchanged || (precision >= 1 && precision <= 2147483647));
     }
 }
@@ -214,15 +218,14 @@ class Limits : public ::testing::TestWithParam<LimitCase> {};
 
 TEST_P(Limits, Digits) {
     const LimitCase& c = GetParam();
-    ZrXmlSchemaBrowser browser;
-    ZrXmlSchemaBrowserTestAccess access(browser);
-    ZrDType type = *browser.TypeByName(wide(c.typeName).c_str());
+    const BuiltinTypes builtins;
+    ZrDType type = *builtins.builtinByName(wide(c.typeName).view());
     if (c.attribute)
         type.Usage(short(type.Usage() + 256));
     type.Precision(kUnchanged);
     type.Length(kUnchanged);
-    access.dtLimits(type, wide(c.minInclusive).c_str(), wide(c.maxInclusive).c_str(),
-                    wide(c.minExclusive).c_str(), wide(c.maxExclusive).c_str());
+    dtLimits(type, wide(c.minInclusive).c_str(), wide(c.maxInclusive).c_str(),
+             wide(c.minExclusive).c_str(), wide(c.maxExclusive).c_str());
     EXPECT_EQ(type.Precision(), c.digits);
     EXPECT_EQ(type.Length(), c.digits);
 }
@@ -237,8 +240,8 @@ SimpleTypeDef simpleType(const std::string& text) {
     std::string name, base, facet;
     in >> name >> base;
     SimpleTypeDef type;
-    type.name = wide(name);
-    type.baseName = wide(base);
+    type.name = wide(name).view();
+    type.baseName = wide(base).view();
     const std::map<std::string, ZrName SimpleTypeDef::*> members = {
         {"length", &SimpleTypeDef::length},    {"maxLength", &SimpleTypeDef::maxLength},
         {"scale", &SimpleTypeDef::scale},      {"precision", &SimpleTypeDef::precision},
@@ -250,7 +253,7 @@ SimpleTypeDef simpleType(const std::string& text) {
         if (key == "enum")
             type.maxEnumLength = std::stoi(value);
         else
-            type.*members.at(key) = wide(value);
+            type.*members.at(key) = wide(value).view();
     }
     return type;
 }
@@ -286,17 +289,15 @@ class Resolve : public ::testing::TestWithParam<ResolveCase> {};
 
 TEST_P(Resolve, DerivesDataType) {
     const ResolveCase& c = GetParam();
-    ZrXmlSchemaBrowser browser;
-    ZrXmlSchemaBrowserTestAccess access(browser);
-    access.simpleTypes().push_back(simpleType(c.type));
+    Typing access;
+    access.model.simpleTypes.push_back(simpleType(c.type));
     LogCapture log;
     ZrDType type;
-    ASSERT_TRUE(access.lookupType(u"t", u"", type));
+    ASSERT_TRUE(access.resolver.lookupType(u"t", u"", type));
     EXPECT_STREQ(type.Alias(), c.alias);
     EXPECT_EQ(type.Length(), c.length);
     EXPECT_EQ(type.Precision(), c.precision);
     EXPECT_EQ(type.DecimalPlaces(), c.decimals);
-    EXPECT_TRUE(access.simpleTypes()[0].resolved);
     EXPECT_EQ(log.lines(), "");
 }
 
@@ -304,46 +305,42 @@ INSTANTIATE_TEST_SUITE_P(Dictionary, Resolve, ::testing::ValuesIn(kResolves),
                          [](const auto& row) { return std::string(row.param.label); });
 
 TEST(ResolveSimpleType, DerivedTypeStartsFromItsResolvedBase) {
-    ZrXmlSchemaBrowser browser;
-    ZrXmlSchemaBrowserTestAccess access(browser);
-    access.simpleTypes().push_back(simpleType("code string maxLength=5"));
-    access.simpleTypes().push_back(simpleType("shortCode code pattern=[A-Z]{3}"));
+    Typing access;
+    access.model.simpleTypes.push_back(simpleType("code string maxLength=5"));
+    access.model.simpleTypes.push_back(simpleType("shortCode code pattern=[A-Z]{3}"));
     ZrDType type;
-    ASSERT_TRUE(access.lookupType(u"shortCode", u"", type));
+    ASSERT_TRUE(access.resolver.lookupType(u"shortCode", u"", type));
     EXPECT_STREQ(type.Alias(), "string");
     EXPECT_EQ(type.Length(), 5);
     EXPECT_EQ(type.Precision(), 3);
-    EXPECT_TRUE(access.simpleTypes()[0].resolved);
 }
 
 TEST(ResolveSimpleType, ResolvesOncePerType) {
-    ZrXmlSchemaBrowser browser;
-    ZrXmlSchemaBrowserTestAccess access(browser);
-    access.simpleTypes().push_back(simpleType("t string maxLength=20"));
+    Typing access;
+    access.model.simpleTypes.push_back(simpleType("t string maxLength=20"));
     ZrDType first;
-    ASSERT_TRUE(access.lookupType(u"t", u"", first));
+    ASSERT_TRUE(access.resolver.lookupType(u"t", u"", first));
     // A later change of the facets is not seen: the first derivation is reused.
-    access.simpleTypes()[0].maxLength = u"99";
+    access.model.simpleTypes[0].maxLength = u"99";
     ZrDType second;
-    ASSERT_TRUE(access.lookupType(u"t", u"", second));
+    ASSERT_TRUE(access.resolver.lookupType(u"t", u"", second));
     EXPECT_EQ(second.Length(), 20);
 }
 
 TEST(ResolveSimpleType, NamespaceMustMatchUnlessGenerated) {
-    ZrXmlSchemaBrowser browser;
-    ZrXmlSchemaBrowserTestAccess access(browser);
+    Typing access;
     SimpleTypeDef named = simpleType("t string maxLength=20");
     named.nameNs = u"urn:a";
-    access.simpleTypes().push_back(named);
-    access.simpleTypes().push_back(simpleType("anon3 string maxLength=30"));
+    access.model.simpleTypes.push_back(named);
+    access.model.simpleTypes.push_back(simpleType("anon3 string maxLength=30"));
     ZrDType type;
-    EXPECT_FALSE(access.lookupType(u"t", u"urn:b", type));
-    ASSERT_TRUE(access.lookupType(u"t", u"urn:a", type));
+    EXPECT_FALSE(access.resolver.lookupType(u"t", u"urn:b", type));
+    ASSERT_TRUE(access.resolver.lookupType(u"t", u"urn:a", type));
     EXPECT_EQ(type.Length(), 20);
-    ASSERT_TRUE(access.lookupType(u"anon3", u"urn:anything", type));
+    ASSERT_TRUE(access.resolver.lookupType(u"anon3", u"urn:anything", type));
     EXPECT_EQ(type.Length(), 30);
     // A built-in alias answers whatever namespace the name carries.
-    ASSERT_TRUE(access.lookupType(u"int", u"urn:anything", type));
+    ASSERT_TRUE(access.resolver.lookupType(u"int", u"urn:anything", type));
     EXPECT_EQ(type.Usage(), 48);
 }
 
@@ -385,34 +382,34 @@ class ResolveFailure : public ::testing::TestWithParam<FailureCase> {};
 
 TEST_P(ResolveFailure, FailsAndLeavesTypeUnresolved) {
     const FailureCase& c = GetParam();
-    ZrXmlSchemaBrowser browser;
-    ZrXmlSchemaBrowserTestAccess access(browser);
+    Typing access;
     for (const char* f : c.types)
-        access.simpleTypes().push_back(simpleType(f));
+        access.model.simpleTypes.push_back(simpleType(f));
     LogCapture log;
     ZrDType type;
     type.Precision(kUnchanged);
-    EXPECT_FALSE(access.lookupType(wide(c.sought).c_str(), u"", type));
+    EXPECT_FALSE(access.resolver.lookupType(wide(c.sought).c_str(), u"", type));
     EXPECT_EQ(type.Precision(), kUnchanged);
     EXPECT_EQ(log.lines(), c.messages);
-    for (SimpleTypeDef& t : access.simpleTypes())
-        EXPECT_FALSE(t.resolved);
+    // Nothing failed is kept: a second lookup fails again, saying why.
+    LogCapture again;
+    EXPECT_FALSE(access.resolver.lookupType(wide(c.sought).c_str(), u"", type));
+    EXPECT_EQ(again.lines(), c.messages);
 }
 
 INSTANTIATE_TEST_SUITE_P(Dictionary, ResolveFailure, ::testing::ValuesIn(kFailures),
                          [](const auto& row) { return std::string(row.param.label); });
 
 TEST(ResolveSimpleType, ComplexTypeIsRefused) {
-    ZrXmlSchemaBrowser browser;
-    ZrXmlSchemaBrowserTestAccess access(browser);
+    Typing access;
     ComplexTypeDef complex;
     complex.name = u"c";
-    access.complexTypes().push_back(complex);
-    access.simpleTypes().push_back(simpleType("t c"));
+    access.model.complexTypes.push_back(complex);
+    access.model.simpleTypes.push_back(simpleType("t c"));
     LogCapture log;
     ZrDType type;
-    EXPECT_FALSE(access.lookupType(u"c", u"", type));
-    EXPECT_FALSE(access.lookupType(u"t", u"", type));
+    EXPECT_FALSE(access.resolver.lookupType(u"c", u"", type));
+    EXPECT_FALSE(access.resolver.lookupType(u"t", u"", type));
     EXPECT_EQ(log.lines(), "512 0 Oops, lookupType asked to lookup a complex type\n"
                            "512 0 Oops, lookupType asked to lookup a complex type\n"
                            "4 0 Error resolving simple type t\n");
@@ -422,15 +419,14 @@ TEST(ResolveSimpleType, ComplexTypeIsRefused) {
 // one at the bound resolves.
 TEST(ResolveSimpleType, LongBaseChainsAreBounded) {
     for (int length : {1000, 1001}) {
-        ZrXmlSchemaBrowser browser;
-        ZrXmlSchemaBrowserTestAccess access(browser);
+        Typing access;
         for (int i = 0; i < length; ++i) {
             const std::string base = i + 1 < length ? "t" + std::to_string(i + 1) : "string";
-            access.simpleTypes().push_back(simpleType("t" + std::to_string(i) + " " + base));
+            access.model.simpleTypes.push_back(simpleType("t" + std::to_string(i) + " " + base));
         }
         LogCapture log;
         ZrDType type;
-        EXPECT_EQ(access.lookupType(u"t0", u"", type), length == 1000);
+        EXPECT_EQ(access.resolver.lookupType(u"t0", u"", type), length == 1000);
         if (length > 1000) {
             ASSERT_FALSE(log.messages.empty());
             EXPECT_EQ(log.messages[0].text, "Schema nesting deeper than 1000 levels at t1000");

@@ -1,13 +1,22 @@
 // Reading helpers of the schema and model tests: read a schema into a fresh
-// browser and print its component model as stable text.
+// model and print it as stable text.
 #pragma once
 
+#include "FPInput.h"
+#include "SchemaReader.h"
 #include "TestSupport.h"
 
 #include <string>
 #include <utility>
+#include <xercesc/util/PlatformUtils.hpp>
 
 namespace zrtest {
+
+// Readers expect the parser library initialised, as the plug-in does before any read.
+inline const bool kParserLibraryReady = [] {
+    xercesc::XMLPlatformUtils::Initialize();
+    return true;
+}();
 
 // "{ns}local", or "local" without a namespace; the XML Schema namespace prints
 // as "xs".
@@ -40,18 +49,18 @@ inline std::string dumpTypeParts(const SimpleTypeDef& t) {
     if (!t.baseName.empty() || !t.baseNs.empty())
         out += " base=" + qname(t.baseName, t.baseNs);
     const std::pair<const char*, const ZrName*> facets[] = {{"minInclusive", &t.minInclusive},
-                                                               {"maxInclusive", &t.maxInclusive},
-                                                               {"minExclusive", &t.minExclusive},
-                                                               {"maxExclusive", &t.maxExclusive},
-                                                               {"length", &t.length},
-                                                               {"minLength", &t.minLength},
-                                                               {"maxLength", &t.maxLength},
-                                                               {"pattern", &t.pattern},
-                                                               {"precision", &t.precision},
-                                                               {"scale", &t.scale},
-                                                               {"encoding", &t.encoding},
-                                                               {"period", &t.period},
-                                                               {"duration", &t.duration}};
+                                                            {"maxInclusive", &t.maxInclusive},
+                                                            {"minExclusive", &t.minExclusive},
+                                                            {"maxExclusive", &t.maxExclusive},
+                                                            {"length", &t.length},
+                                                            {"minLength", &t.minLength},
+                                                            {"maxLength", &t.maxLength},
+                                                            {"pattern", &t.pattern},
+                                                            {"precision", &t.precision},
+                                                            {"scale", &t.scale},
+                                                            {"encoding", &t.encoding},
+                                                            {"period", &t.period},
+                                                            {"duration", &t.duration}};
     for (const auto& [key, value] : facets) {
         if (!value->empty())
             out += std::string(" ") + key + "=" + utf8(*value);
@@ -63,11 +72,11 @@ inline std::string dumpTypeParts(const SimpleTypeDef& t) {
 
 // Top-level declarations, then complex types with their content, then simple
 // types, each in stored order.
-inline std::string dumpModel(ZrXmlSchemaBrowserTestAccess& a) {
+inline std::string dumpModel(const SchemaModel& model) {
     std::string out;
-    for (const ElementDef& e : a.globalElements())
+    for (const ElementDef& e : model.globalElements)
         out += "global " + dumpElement(e) + "\n";
-    for (const ComplexTypeDef& t : a.complexTypes()) {
+    for (const ComplexTypeDef& t : model.complexTypes) {
         out += "complexType " + dumpTypeParts(t);
         if (t.isGroup)
             out += " group";
@@ -77,7 +86,7 @@ inline std::string dumpModel(ZrXmlSchemaBrowserTestAccess& a) {
         for (const ElementDef& e : t.content)
             out += "  " + dumpElement(e) + "\n";
     }
-    for (const SimpleTypeDef& t : a.simpleTypes())
+    for (const SimpleTypeDef& t : model.simpleTypes)
         out += "simpleType " + dumpTypeParts(t) + "\n";
     return out;
 }
@@ -109,19 +118,19 @@ class ChunkLimit {
 
 struct ReadOutcome {
     bool ok;
-    std::string model; // dumpModel of the browser after the read
+    std::string model; // dumpModel after the read
     std::string log;   // LogCapture lines, the temporary folder shown as "$DIR"
 };
 
-// Reads `mainPath` with a fresh browser.
+// Reads `mainPath` into a fresh model.
 inline ReadOutcome readSchemaFile(const std::string& mainPath, const std::string& dir,
                                   XMLSize_t chunk = 0) {
     ChunkLimit limit(chunk);
     LogCapture log;
-    ZrXmlSchemaBrowser browser;
-    ZrXmlSchemaBrowserTestAccess access(browser);
-    const bool ok = browser.ReadSchema(wide(mainPath).c_str(), false);
-    return {ok, dumpModel(access), replaceAll(log.lines(), dir, "$DIR")};
+    SchemaModel model;
+    SchemaReader reader(model);
+    const bool ok = reader.read(wide(mainPath).c_str());
+    return {ok, dumpModel(model), replaceAll(log.lines(), dir, "$DIR")};
 }
 
 // Reads one schema document given as text.

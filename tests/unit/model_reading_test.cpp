@@ -292,18 +292,14 @@ TEST(ModelReading, DefaultNamespaceSchemaReadsLikeAPrefixedOne) {
 // Facets inside a complex type's restriction reach only the working simple type,
 // and the next simple type starts clean.
 TEST(ModelReading, StrayFacetsLandInTheWorkingSimpleType) {
-    TempDir dir;
-    const std::string path =
-        dir.write("main.xsd",
-                  schemaDoc(R"(<xs:complexType name="C"><xs:simpleContent><xs:restriction base="B">
+    const ReadOutcome read = readSchemaText(
+        schemaDoc(R"(<xs:complexType name="C"><xs:simpleContent><xs:restriction base="B">
                        <xs:maxLength value="8"/></xs:restriction></xs:simpleContent>
-                     </xs:complexType>)"));
-    ZrXmlSchemaBrowser browser;
-    ZrXmlSchemaBrowserTestAccess access(browser);
-    ASSERT_TRUE(browser.ReadSchema(wide(path).c_str(), false));
-    EXPECT_EQ(utf8(access.currentSimpleType().maxLength), "8");
-    EXPECT_TRUE(access.complexTypes()[0].maxLength.empty());
-    EXPECT_EQ(access.typeTarget(), &access.currentComplexType());
+                     </xs:complexType>
+                     <xs:simpleType name="S"><xs:restriction base="xs:string"/></xs:simpleType>)"));
+    EXPECT_TRUE(read.ok);
+    EXPECT_EQ(read.model, "complexType C base=B simpleContent\n"
+                          "simpleType S base={xs}string\n");
 }
 
 // A second read with the same browser starts from an empty model and numbers
@@ -314,51 +310,47 @@ TEST(ModelReading, RereadingGivesTheSameModel) {
         dir.write("main.xsd", schemaDoc(R"(<xs:element name="e"><xs:complexType>
             <xs:attribute name="a"><xs:simpleType><xs:restriction base="xs:string"/>
             </xs:simpleType></xs:attribute></xs:complexType></xs:element>)"));
-    ZrXmlSchemaBrowser browser;
-    ZrXmlSchemaBrowserTestAccess access(browser);
-    ASSERT_TRUE(browser.ReadSchema(wide(path).c_str(), false));
-    const std::string first = dumpModel(access);
-    ASSERT_TRUE(browser.ReadSchema(wide(path).c_str(), false));
-    EXPECT_EQ(dumpModel(access), first);
-    EXPECT_EQ(access.anonCounter(), 2);
+    SchemaModel model;
+    SchemaReader reader(model);
+    ASSERT_TRUE(reader.read(wide(path).c_str()));
+    const std::string first = dumpModel(model);
+    ASSERT_TRUE(reader.read(wide(path).c_str()));
+    EXPECT_EQ(dumpModel(model), first);
+    EXPECT_EQ(model.anonCount, 2);
 }
 
 // Null names are accepted: a generated-looking name is found whatever the
 // namespace, no name finds nothing (the index is checked in model_index_lookup.cpp).
 TEST(ModelLookup, NullNamesAndNamespaces) {
-    ZrXmlSchemaBrowser browser;
-    ZrXmlSchemaBrowserTestAccess access(browser);
+    SchemaModel model;
     ComplexTypeDef t;
     t.name = u"anonymous";
     t.nameNs = u"urn:c";
-    access.complexTypes().push_back(t);
-    EXPECT_EQ(access.findComplexType(u"anonymous", nullptr), &access.complexTypes()[0]);
-    EXPECT_EQ(access.findComplexType(nullptr, nullptr), nullptr);
+    model.complexTypes.push_back(t);
+    EXPECT_EQ(model.findComplexType(u"anonymous", {}), &model.complexTypes[0]);
+    EXPECT_EQ(model.findComplexType({}, {}), nullptr);
 }
 
 TEST(ModelRecords, ClearKeepsWhatTheReaderReliesOn) {
     ElementDef e;
-    e.name = wide("n");
-    e.refName = wide("r");
+    e.name = wide("n").view();
+    e.refName = wide("r").view();
     e.isAttribute = true;
     e.nullable = false;
     e.clear();
     EXPECT_EQ(dumpElement(e), "element !nullable");
 
     ComplexTypeDef t;
-    t.name = wide("t");
-    t.maxLength = wide("3");
+    t.name = u"t";
+    t.maxLength = u"3";
     t.maxEnumLength = 4;
-    t.resolved = true;
-    t.facetAttrName = wide("value");
     t.content.push_back(e);
     t.isGroup = true;
     t.simpleContent = true;
     t.clear();
     EXPECT_EQ(dumpTypeParts(t), "");
     EXPECT_TRUE(t.content.empty());
-    EXPECT_FALSE(t.isGroup || t.simpleContent || t.resolved);
-    EXPECT_EQ(utf8(t.facetAttrName), "value");
+    EXPECT_FALSE(t.isGroup || t.simpleContent);
 }
 
 } // namespace

@@ -135,46 +135,36 @@ TEST(Driver, UnreadableFileFailsTheRead) {
                         "8 4 Schema: Fatal: At line 1, column 1 of file $DIR/mem: *\n");
 }
 
-TEST(Driver, InitialisationErrorIsReportedAndNothingIsRead) {
-    ZrXmlSchemaBrowser browser;
-    ZrXmlSchemaBrowserTestAccess access(browser);
-    access.initialised() = false;
-    access.initError() = wide("no locale");
-    LogCapture log;
-    EXPECT_FALSE(browser.ReadSchema(u"/nonexistent/schema.xsd", false));
-    EXPECT_EQ(log.lines(), "4 19 SchemaBrowser: Initialization error: no locale\n");
-}
-
 TEST(Driver, DiagnosticsNameThePlaceAndKeepTheTextAfterMessage) {
     struct Row {
-        void (ZrXmlSchemaBrowser::*callback)(const xercesc::SAXParseException&);
+        void (SchemaReader::*callback)(const xercesc::SAXParseException&);
         const char16_t* message;
         bool fails;
         const char* logged;
     };
 
     const Row rows[] = {
-        {&ZrXmlSchemaBrowser::warning, u"plain text", false,
+        {&SchemaReader::warning, u"plain text", false,
          "2 4 Schema: Warning: At line 3, column 5 of file /s.xsd: plain text\n"},
-        {&ZrXmlSchemaBrowser::error, u"Type:X, Message: the cause", true,
+        {&SchemaReader::error, u"Type:X, Message: the cause", true,
          "4 4 Schema: Error: At line 3, column 5 of file /s.xsd:  the cause\n"},
-        {&ZrXmlSchemaBrowser::fatalError, u"Message:first Message:second", true,
+        {&SchemaReader::fatalError, u"Message:first Message:second", true,
          "8 4 Schema: Fatal: At line 3, column 5 of file /s.xsd: first Message:second\n"},
     };
     for (const Row& row : rows) {
-        ZrXmlSchemaBrowser browser;
-        ZrXmlSchemaBrowserTestAccess access(browser);
+        SchemaModel model;
+        SchemaReader reader(model);
         LogCapture log;
         const xercesc::SAXParseException e(row.message, u"", u"/s.xsd", 3, 5);
-        (browser.*row.callback)(e);
+        (reader.*row.callback)(e);
         EXPECT_EQ(log.lines(), row.logged);
-        EXPECT_EQ(access.failed(), row.fails);
+        EXPECT_EQ(reader.hasFailed(), row.fails);
     }
 }
 
 // A read that failed half-way leaves documents queued and a declaration open;
-// the next read on the same browser starts clean all the same.
-TEST(Driver, ABrowserIsReusableAfterAFailedRead) {
+// the next read on the same reader starts clean all the same.
+TEST(Driver, AReaderIsReusableAfterAFailedRead) {
     TempDir dir;
     const std::string failing =
         dir.write("failing.xsd", schemaDoc(R"(<xs:include schemaLocation="later.xsd"/>
@@ -183,15 +173,13 @@ TEST(Driver, ABrowserIsReusableAfterAFailedRead) {
     dir.write("later.xsd", schemaDoc(R"(<xs:element name="later" type="xs:string"/>)"));
     const std::string good =
         dir.write("good.xsd", schemaDoc(R"(<xs:element name="good" type="xs:string"/>)"));
-    ZrXmlSchemaBrowser browser;
-    ZrXmlSchemaBrowserTestAccess access(browser);
+    SchemaModel model;
+    SchemaReader reader(model);
     LogCapture log;
-    EXPECT_FALSE(browser.ReadSchema(wide(failing).c_str(), false));
-    EXPECT_EQ(access.documentQueue().size(), 1u);
-    EXPECT_FALSE(access.currentElement().nullable);
-    EXPECT_TRUE(browser.ReadSchema(wide(good).c_str(), false));
-    EXPECT_EQ(dumpModel(access), "global element name=good type={xs}string\n");
-    EXPECT_TRUE(access.documentQueue().empty());
+    EXPECT_FALSE(reader.read(wide(failing).c_str()));
+    // Neither the queued document nor the open declaration's flag carries over.
+    EXPECT_TRUE(reader.read(wide(good).c_str()));
+    EXPECT_EQ(dumpModel(model), "global element name=good type={xs}string\n");
 }
 
 // Declarations, types and groups nested without end are refused before the state

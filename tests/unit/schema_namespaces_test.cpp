@@ -9,14 +9,14 @@ using namespace zrtest;
 
 // Default namespace urn:d, target namespace urn:t, prefixes a, b and t (t also
 // bound to the target namespace), and "zrxxxtrg" declared by the schema itself.
-void setUpNamespaces(ZrXmlSchemaBrowserTestAccess& a) {
-    a.defaultNamespace() = wide("urn:d");
-    a.targetNamespace() = wide("urn:t");
-    a.namespacePrefixes()[wide("a")] = wide("urn:shared");
-    a.namespacePrefixes()[wide("b")] = wide("urn:shared");
-    a.namespacePrefixes()[wide("t")] = wide("urn:t");
-    a.namespacePrefixes()[wide("zrxxxtrg")] = wide("urn:own");
-    a.namespacePrefixes()[wide("")] = wide("urn:empty");
+void setUpNamespaces(NamespaceBindings& bindings) {
+    bindings.defaultNamespace = u"urn:d";
+    bindings.targetNamespace = u"urn:t";
+    bindings.prefixes[u"a"] = u"urn:shared";
+    bindings.prefixes[u"b"] = u"urn:shared";
+    bindings.prefixes[u"t"] = u"urn:t";
+    bindings.prefixes[u"zrxxxtrg"] = u"urn:own";
+    bindings.prefixes[u""] = u"urn:empty";
 }
 
 struct ParseCase {
@@ -34,31 +34,27 @@ TEST(Namespaces, ParseNameSplitsAtTheFirstColonAndResolvesThePrefix) {
         {":x", true, "x", "urn:empty"},     {"a:", true, "", "urn:shared"},
         {"", false, "", "urn:t"},
     };
-    ZrXmlSchemaBrowser browser;
-    ZrXmlSchemaBrowserTestAccess access(browser);
-    setUpNamespaces(access);
+    SchemaModel model;
+    SchemaReader reader(model);
+    setUpNamespaces(model.namespaces);
     for (const ParseCase& c : cases) {
         SCOPED_TRACE(std::string(c.name) + (c.useDefault ? " default" : " target"));
-        ZrWString local = wide("old");
-        ZrWString ns = wide("old");
-        access.parseName(wide(c.name).c_str(), c.useDefault, local, ns);
+        ZrName local(u"old");
+        ZrName ns(u"old");
+        reader.parseName(wide(c.name).c_str(), c.useDefault, local, ns);
         EXPECT_EQ(utf8(local), c.local);
         EXPECT_EQ(utf8(ns), c.ns);
     }
     // The text may live in an output.
     ZrName local(u"a:in");
     ZrName ns;
-    access.parseName(local.c_str(), true, local, ns);
+    reader.parseName(local.c_str(), true, local, ns);
     EXPECT_EQ(utf8(local) + " " + utf8(ns), "in urn:shared");
 }
 
-TEST(Namespaces, LookupAndReverse) {
-    ZrXmlSchemaBrowser browser;
-    ZrXmlSchemaBrowserTestAccess access(browser);
-    setUpNamespaces(access);
-    EXPECT_EQ(utf8(std::u16string_view(access.LookupNamespace(u"a"))), "urn:shared");
-    EXPECT_EQ(utf8(std::u16string_view(access.LookupNamespace(u"zrxxxtrg"))), "urn:t");
-    EXPECT_EQ(access.LookupNamespace(u"nope"), nullptr);
+TEST(Namespaces, Reverse) {
+    SchemaModel model;
+    setUpNamespaces(model.namespaces);
 
     struct ReverseCase {
         const char* uri;
@@ -71,33 +67,31 @@ TEST(Namespaces, LookupAndReverse) {
         {"urn:shared", true, "a"},   {"urn:own", false, "zrxxxtrg"}, {"urn:none", true, ""},
         {"urn:empty", false, ""},
     };
+    const PrefixWriter writer(model.namespaces);
     for (const ReverseCase& c : cases) {
         SCOPED_TRACE(c.uri);
-        const XMLCh* prefix = access.ReverseNamespace(wide(c.uri).c_str(), c.useTargetPrefix);
-        ASSERT_NE(prefix, nullptr);
-        EXPECT_EQ(utf8(std::u16string_view(prefix)), c.prefix);
+        EXPECT_EQ(utf8(writer.prefixOf(zrUtf8ToUtf16(c.uri), c.useTargetPrefix)), c.prefix);
     }
     // Default and target namespace the same URI.
-    access.defaultNamespace() = wide("urn:t");
-    EXPECT_EQ(utf8(std::u16string_view(access.ReverseNamespace(u"urn:t", false))), "");
-    EXPECT_EQ(utf8(std::u16string_view(access.ReverseNamespace(u"urn:t", true))), "zrxxxtrg");
+    model.namespaces.defaultNamespace = u"urn:t";
+    const PrefixWriter sameUri(model.namespaces);
+    EXPECT_EQ(utf8(sameUri.prefixOf(u"urn:t", false)), "");
+    EXPECT_EQ(utf8(sameUri.prefixOf(u"urn:t", true)), "zrxxxtrg");
 }
 
 TEST(Namespaces, FirstElementAttributesDeclareTheNamespaces) {
     TempDir dir;
-    ZrXmlSchemaBrowser browser;
-    ZrXmlSchemaBrowserTestAccess access(browser);
     LogCapture log;
     const std::string valid = dir.write(
         "valid.xsd", std::string("<x:schema xmlns:x=\"") + kXsdNs +
                          R"(" xmlnsFoo="urn:d" xmlns:="urn:e" targetNamespace="urn:t" version="1"
                  elementFormDefault="qualified" attributeFormDefault="unqualified" id="s">
                <x:element name="e" type=":T"/><x:element name="f" type="T"/></x:schema>)");
-    EXPECT_TRUE(browser.ReadSchema(wide(valid).c_str(), false));
-    EXPECT_EQ(log.lines(), "512 0 Unknown first element attribute 'id'\n");
-    EXPECT_EQ(dumpModel(access), "global element name={urn:t}e type={urn:e}T\n"
-                                 "global element name={urn:t}f type={urn:d}T\n");
-    EXPECT_EQ(utf8(access.schemaNamespace()), kXsdNs);
+    const ReadOutcome read = readSchemaFile(valid, dir.path().string());
+    EXPECT_TRUE(read.ok);
+    EXPECT_EQ(read.log, "512 0 Unknown first element attribute 'id'\n");
+    EXPECT_EQ(read.model, "global element name={urn:t}e type={urn:e}T\n"
+                          "global element name={urn:t}f type={urn:d}T\n");
 }
 
 // Only the first element of a document declares namespaces, whatever its name.

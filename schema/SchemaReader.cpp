@@ -1,5 +1,6 @@
-#include "ZrXmlSchemaBrowser.h"
+#include "SchemaReader.h"
 
+#include "FPInput.h"
 #include "ParserConfig.h"
 #include "zrglob.h"
 
@@ -15,19 +16,9 @@
 using xercesc::SAXParseException;
 using xercesc::XMLPlatformUtils;
 
-ZrXmlSchemaBrowser::ZrXmlSchemaBrowser() {
-    try {
-        XMLPlatformUtils::Initialize(xercesc::XMLUni::fgXercescDefaultLocale, nullptr, nullptr,
-                                     nullptr);
-    } catch (const xercesc::XMLException& e) {
-        initialised = false;
-        ZrXmlUtils::XMLChToWchar(e.getMessage(), initError, false);
-    }
-    defineBuiltinTypes();
-}
+SchemaReader::SchemaReader(SchemaModel& target) : model(target) {}
 
-// The parser library stays initialised: other browsers and the host may use it.
-ZrXmlSchemaBrowser::~ZrXmlSchemaBrowser() = default;
+SchemaReader::~SchemaReader() = default;
 
 namespace {
 
@@ -79,102 +70,67 @@ std::u16string normaliseLocation(std::u16string_view location) {
 
 } // namespace
 
-bool ZrXmlSchemaBrowser::queueDocument(const ZrWString& location) {
+bool SchemaReader::queueDocument(const ZrWString& location) {
     if (!queuedDocuments.insert(ZrWString(normaliseLocation(location.view()))).second)
         return false;
     documentQueue.push_back(location);
     return true;
 }
 
-bool ZrXmlSchemaBrowser::ReadSchema(const ZrWChar* path, bool qualified) {
-    if (!initialised) {
-        ZrGlob::LogMessage(ZR_SEV_ERROR, BE_READ_FAILED,
-                           lgettext(u"SchemaBrowser: Initialization error: %s"), initError.c_str());
-        return false;
+bool SchemaReader::read(const ZrWChar* path) {
+    auto parser = std::make_unique<SchemaParser>();
+    parser->setDocumentHandler(this);
+    parser->setErrorHandler(this);
+    parser->setEntityResolver(this);
+
+    model.clear();
+    recentPrefixesStale = true;
+    elementStack.clear();
+    currentElement.clear();
+    // A read that failed inside a non-nullable declaration must not hand that flag
+    // to the first declaration of this one.
+    currentElement.nullable = true;
+    complexTypeStack.clear();
+    currentComplexType.clear();
+    complexDepth = 0;
+    currentSimpleType.clear();
+    typeTarget = nullptr;
+    groupOpenedDefinition.clear();
+    for (ZrName& recent : recentNamespaces)
+        recent.clear();
+    documentQueue.clear();
+    queuedDocuments.clear();
+
+    documentPath_ = path;
+    queueDocument(documentPath_);
+
+    while (!documentQueue.empty()) {
+        firstElement = true;
+        failed = false;
+        skipDepth = 0;
+        documentPath_ = std::move(documentQueue.front());
+        documentQueue.pop_front();
+        documentURI = documentPath_.c_str();
+        parseDocument(*parser);
+        if (failed)
+            return false;
     }
-    qualifiedRecords = qualified;
-
-    try {
-        auto parser = std::make_unique<SchemaParser>();
-        parser->setDocumentHandler(this);
-        parser->setErrorHandler(this);
-        parser->setEntityResolver(this);
-
-        defaultNamespace.clear();
-        targetNamespace.clear();
-        namespacePrefixes.clear();
-        recentPrefixesStale = true;
-
-        elementStack.clear();
-        currentElement.clear();
-        // A read that failed inside a non-nullable declaration must not hand that
-        // flag to the first declaration of this one.
-        currentElement.nullable = true;
-        complexTypeStack.clear();
-        currentComplexType.clear();
-        complexDepth = 0;
-        currentSimpleType.clear();
-        simpleTypes.clear();
-        complexTypes.clear();
-        globalElements.clear();
-        anonCounter = 0;
-        groupOpenedDefinition.clear();
-        names.clear();
-
-        records.Clear();
-        recordsByName.clear();
-        recordWorkList.clear();
-        openRecordCount = 0;
-        documentQueue.clear();
-        queuedDocuments.clear();
-
-        documentPath = path;
-        queueDocument(documentPath);
-
-        while (!documentQueue.empty()) {
-            firstElement = true;
-            failed = false;
-            skipDepth = 0;
-            documentPath = std::move(documentQueue.front());
-            documentQueue.pop_front();
-            documentURI = documentPath.c_str();
-            parseDocument(*parser);
-            if (failed)
-                return false;
-        }
-
-        fieldTypes.clear();
-        for (size_t i = 0; i < globalElements.size(); ++i) {
-            const ElementDef& declaration = globalElements[i];
-            ComplexTypeDef* type =
-                findComplexType(declaration.typeName.view(), declaration.typeNs.view());
-            recordWorkList.clear();
-            openRecordCount = 0;
-            if (type && !buildRecord(declaration))
-                return false;
-        }
-        return true;
-    } catch (const xercesc::OutOfMemoryException&) {
-        logOutOfMemory();
-    } catch (const std::bad_alloc&) {
-        logOutOfMemory();
-    }
-    return false;
+    return true;
 }
 
 // Formatting the message may itself run out of memory; nothing may leave the read.
-void ZrXmlSchemaBrowser::logOutOfMemory() {
+void SchemaReader::logOutOfMemory() {
     try {
         ZrGlob::LogMessage(ZR_SEV_ERROR, BE_NO_MEMORY,
                            lgettext(u"Schema: Out of memory reading file %s"),
-                           documentPath.c_str());
+                           documentPath_.c_str());
     } catch (...) {
     }
 }
 
-void ZrXmlSchemaBrowser::parseDocument(xercesc::SAXParser& parser) {
+void SchemaReader::parseDocument(xercesc::SAXParser& parser) {
     try {
-        FPInputSource source(documentPath.c_str());
+        FPInputSource source(documentPath_.c_str());
         parser.parse(source);
         if (source.readFailed())
             failed = true;
@@ -188,7 +144,7 @@ void ZrXmlSchemaBrowser::parseDocument(xercesc::SAXParser& parser) {
         ZrGlob::LogMessage(
             ZR_SEV_ERROR, 4,
             lgettext(u"Schema: Error: Entity '%s' in file %s is longer than %d characters"),
-            e.name.c_str(), documentPath.c_str(), static_cast<int>(kSchemaEntityValueLimit));
+            e.name.c_str(), documentPath_.c_str(), static_cast<int>(kSchemaEntityValueLimit));
         failed = true;
     } catch (const xercesc::XMLException& e) {
         logParseStopped(e.getMessage());
@@ -203,9 +159,9 @@ void ZrXmlSchemaBrowser::parseDocument(xercesc::SAXParser& parser) {
     }
 }
 
-void ZrXmlSchemaBrowser::logParseStopped(const XMLCh* message) {
+void SchemaReader::logParseStopped(const XMLCh* message) {
     ZrGlob::LogMessage(ZR_SEV_ERROR, 4, lgettext(u"Schema: Error: Reading file %s stopped: %s"),
-                       documentPath.c_str(), message ? message : u"");
+                       documentPath_.c_str(), message ? message : u"");
     failed = true;
 }
 
@@ -227,17 +183,17 @@ void logParserDiagnostic(int severity, const XMLCh* format, const SAXParseExcept
 
 } // namespace
 
-void ZrXmlSchemaBrowser::warning(const SAXParseException& e) {
+void SchemaReader::warning(const SAXParseException& e) {
     logParserDiagnostic(ZR_SEV_WARNING, u"Schema: Warning: At line %d, column %d of file %s: %s",
                         e);
 }
 
-void ZrXmlSchemaBrowser::error(const SAXParseException& e) {
+void SchemaReader::error(const SAXParseException& e) {
     logParserDiagnostic(ZR_SEV_ERROR, u"Schema: Error: At line %d, column %d of file %s: %s", e);
     failed = true;
 }
 
-void ZrXmlSchemaBrowser::fatalError(const SAXParseException& e) {
+void SchemaReader::fatalError(const SAXParseException& e) {
     logParserDiagnostic(ZR_SEV_FATAL, u"Schema: Fatal: At line %d, column %d of file %s: %s", e);
     failed = true;
 }
@@ -246,12 +202,11 @@ void ZrXmlSchemaBrowser::fatalError(const SAXParseException& e) {
 // through entities: an external entity or DTD could make the parser open any
 // local file or reach the network. The request fails the read and is answered
 // with an empty document, so nothing is opened.
-xercesc::InputSource* ZrXmlSchemaBrowser::resolveEntity(const XMLCh* publicId,
-                                                        const XMLCh* systemId) {
+xercesc::InputSource* SchemaReader::resolveEntity(const XMLCh* publicId, const XMLCh* systemId) {
     const XMLCh* name = systemId && *systemId ? systemId : publicId;
     ZrGlob::LogMessage(ZR_SEV_ERROR, 4,
                        lgettext(u"Schema: Error: External entity '%s' in file %s is not read"),
-                       name ? name : u"", documentPath.c_str());
+                       name ? name : u"", documentPath_.c_str());
     failed = true;
     static const XMLByte kNothing[] = {0};
     return new xercesc::MemBufInputSource(kNothing, 0, systemId ? systemId : u"", false);

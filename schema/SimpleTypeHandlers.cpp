@@ -1,4 +1,4 @@
-#include "ZrXmlSchemaBrowser.h"
+#include "SchemaReader.h"
 #include "zrglob.h"
 
 #include <climits>
@@ -6,7 +6,7 @@
 
 // Simple types do not nest: a simple type starting inside another replaces the
 // working record, and the outer one's end stores what the inner one left.
-void ZrXmlSchemaBrowser::doSimpleType(xercesc::AttributeList& attrs) {
+void SchemaReader::doSimpleType(xercesc::AttributeList& attrs) {
     currentSimpleType.clear();
     typeTarget = &currentSimpleType;
     beginTypeDefinition(attrs, currentSimpleType);
@@ -14,14 +14,14 @@ void ZrXmlSchemaBrowser::doSimpleType(xercesc::AttributeList& attrs) {
 
 // The working record stays filled: facets met before the next simple type still
 // land in it, and an enclosing simple type stores it once more.
-void ZrXmlSchemaBrowser::finishSimpleType() {
-    simpleTypes.push_back(currentSimpleType);
+void SchemaReader::finishSimpleType() {
+    model.simpleTypes.push_back(currentSimpleType);
     typeTarget = &currentComplexType;
 }
 
 // Before the browser has met any complex or simple type there is nothing to
 // restrict: the base is dropped.
-void ZrXmlSchemaBrowser::doRestriction(xercesc::AttributeList& attrs) {
+void SchemaReader::doRestriction(xercesc::AttributeList& attrs) {
     for (XMLSize_t i = 0; i < attrs.getLength(); ++i) {
         if (XmlName(attrs.getName(i)) != u"base" || !typeTarget)
             continue;
@@ -29,18 +29,16 @@ void ZrXmlSchemaBrowser::doRestriction(xercesc::AttributeList& attrs) {
     }
 }
 
-void ZrXmlSchemaBrowser::finishRestriction() {}
-
 // A list types its values as text; its item type, named or inline, plays no part,
 // so its content is skipped together with its end tag.
-void ZrXmlSchemaBrowser::doList(xercesc::AttributeList&) {
+void SchemaReader::doList(xercesc::AttributeList&) {
     if (typeTarget)
         parseName(u"string", true, typeTarget->baseName, typeTarget->baseNs);
     ++skipDepth;
 }
 
-void ZrXmlSchemaBrowser::doFacet(xercesc::AttributeList& attrs, SimpleTypeDef& type,
-                                 const XMLCh* facetName) {
+void SchemaReader::doFacet(xercesc::AttributeList& attrs, SimpleTypeDef& type,
+                           const XMLCh* facetName) {
     struct TextFacet {
         std::u16string_view name;
         ZrName SimpleTypeDef::*field;
@@ -65,10 +63,8 @@ void ZrXmlSchemaBrowser::doFacet(xercesc::AttributeList& attrs, SimpleTypeDef& t
     ZrName value;
     bool hasValue = false;
     for (XMLSize_t i = 0; i < attrs.getLength(); ++i) {
-        type.facetAttrName = names.intern(xmlText(attrs.getName(i)));
-        type.facetAttrValue = names.intern(xmlText(attrs.getValue(i)));
-        if (type.facetAttrName == u"value") {
-            value = type.facetAttrValue;
+        if (XmlName(attrs.getName(i)) == u"value") {
+            value = model.names.intern(xmlText(attrs.getValue(i)));
             hasValue = true;
         }
     }

@@ -1,4 +1,4 @@
-#include "ZrXmlSchemaBrowser.h"
+#include "SchemaReader.h"
 #include "zrglob.h"
 
 namespace {
@@ -20,7 +20,7 @@ bool isAbsoluteLocation(const char* location) {
 // Queues the included document; it is parsed after the current one. A relative
 // location is taken from the directory of the document that holds the include,
 // its own directory part kept.
-void ZrXmlSchemaBrowser::doInclude(xercesc::AttributeList& attrs) {
+void SchemaReader::doInclude(xercesc::AttributeList& attrs) {
     for (XMLSize_t i = 0; i < attrs.getLength(); ++i) {
         ZrXmlUtils::XMLChToWchar(attrs.getName(i), nameBuffer, false);
         if (nameBuffer.view() != u"schemaLocation")
@@ -43,5 +43,3 @@ void ZrXmlSchemaBrowser::doInclude(xercesc::AttributeList& attrs) {
         queueDocument(location);
     }
 }
-
-void ZrXmlSchemaBrowser::finishInclude() {}

@@ -1,8 +1,8 @@
-#include "ZrXmlSchemaBrowser.h"
+#include "SchemaReader.h"
 #include "zrglob.h"
 
 // Starts a declaration; the enclosing one waits on elementStack until the end tag.
-void ZrXmlSchemaBrowser::doElement(xercesc::AttributeList& attrs, bool isAttribute) {
+void SchemaReader::doElement(xercesc::AttributeList& attrs, bool isAttribute) {
     if (tooDeep())
         return;
     // clear() would empty everything moved out but keep nullable, which a move
@@ -30,11 +30,11 @@ void ZrXmlSchemaBrowser::doElement(xercesc::AttributeList& attrs, bool isAttribu
 
 // Stores the finished declaration in the definition around it, or among the
 // top-level declarations when none is open, and brings the enclosing one back.
-void ZrXmlSchemaBrowser::finishElement() {
+void SchemaReader::finishElement() {
     if (complexDepth != 0)
         currentComplexType.content.push_back(std::move(currentElement));
     else
-        globalElements.push_back(std::move(currentElement));
+        model.globalElements.push_back(std::move(currentElement));
     if (elementStack.empty()) {
         currentElement = ElementDef();
         return;

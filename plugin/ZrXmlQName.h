@@ -5,18 +5,20 @@
 #include "zrstring.h"
 
 class ZRBXMLS_API ZrXmlQName {
-public:
+  public:
     ZrXmlQName();
     ZrXmlQName(const ZrXmlQName& other);
     ZrXmlQName& operator=(const ZrXmlQName& other);
     ~ZrXmlQName();
 
     const ZrXString& localPart() const { return localPart_; }
+
     const ZrXString& namespaceURI() const { return namespaceURI_; }
+
     // True when both parts are empty.
     bool isNull() const;
 
-private:
+  private:
     ZrXString localPart_;
     ZrXString namespaceURI_;
 };

@@ -1,32 +1,27 @@
-#include "ZrXmlSchemaBrowser.h"
+#include "SchemaReader.h"
 #include "zrglob.h"
 
 namespace {
 
 // Gives a component without a name the next generated one.
-void nameIfAnonymous(ZrName& name, int32_t& anonCounter) {
+void nameIfAnonymous(ZrName& name, int32_t& anonCount) {
     if (!name.empty())
         return;
     ZrWString generated;
-    wsfmt(generated, u"anon%d", anonCounter++);
-    name = generated;
+    wsfmt(generated, u"anon%d", anonCount++);
+    name = generated.view();
 }
 
-// Saves the working complex type on the stack and leaves it cleared. The fields
-// clear() keeps (the data type and the facet scratch) are copied back, so the
-// working record ends as it would after saving a copy; the content moves.
+// Saves the working complex type on the stack and leaves it cleared; the content
+// moves.
 void saveComplexType(ComplexTypeDef& working, std::vector<ComplexTypeDef>& stack) {
     stack.push_back(std::move(working));
-    const ComplexTypeDef& saved = stack.back();
     working.clear();
-    working.dataType = saved.dataType;
-    working.facetAttrName = saved.facetAttrName;
-    working.facetAttrValue = saved.facetAttrValue;
 }
 
 } // namespace
 
-void ZrXmlSchemaBrowser::doComplexType(xercesc::AttributeList& attrs) {
+void SchemaReader::doComplexType(xercesc::AttributeList& attrs) {
     if (tooDeep())
         return;
     saveComplexType(currentComplexType, complexTypeStack);
@@ -37,7 +32,7 @@ void ZrXmlSchemaBrowser::doComplexType(xercesc::AttributeList& attrs) {
 
 // The start of a simple or complex type: its name and base, a generated name when it
 // has none, and the type of the declaration around it when that names none.
-void ZrXmlSchemaBrowser::beginTypeDefinition(xercesc::AttributeList& attrs, SimpleTypeDef& type) {
+void SchemaReader::beginTypeDefinition(xercesc::AttributeList& attrs, SimpleTypeDef& type) {
     for (XMLSize_t i = 0; i < attrs.getLength(); ++i) {
         const XmlName attr(attrs.getName(i));
         const XMLCh* value = attrs.getValue(i);
@@ -48,7 +43,7 @@ void ZrXmlSchemaBrowser::beginTypeDefinition(xercesc::AttributeList& attrs, Simp
         else if (attr == u"base")
             parseName(value, true, type.baseName, type.baseNs);
     }
-    nameIfAnonymous(type.name, anonCounter);
+    nameIfAnonymous(type.name, model.anonCount);
 
     // A type defined inside a declaration without a "type" attribute becomes its
     // type; outside any declaration this lands in the idle record.
@@ -58,10 +53,10 @@ void ZrXmlSchemaBrowser::beginTypeDefinition(xercesc::AttributeList& attrs, Simp
     }
 }
 
-void ZrXmlSchemaBrowser::finishComplexType() {
+void SchemaReader::finishComplexType() {
     if (complexTypeStack.empty())
         return;
-    complexTypes.push_back(std::move(currentComplexType));
+    model.complexTypes.push_back(std::move(currentComplexType));
     currentComplexType = std::move(complexTypeStack.back());
     complexTypeStack.pop_back();
     --complexDepth;
@@ -69,7 +64,7 @@ void ZrXmlSchemaBrowser::finishComplexType() {
 }
 
 // The base always belongs to the working complex type, whatever typeTarget says.
-void ZrXmlSchemaBrowser::doExtension(xercesc::AttributeList& attrs) {
+void SchemaReader::doExtension(xercesc::AttributeList& attrs) {
     for (XMLSize_t i = 0; i < attrs.getLength(); ++i) {
         const XmlName attr(attrs.getName(i));
         const XMLCh* value = attrs.getValue(i);
@@ -80,11 +75,9 @@ void ZrXmlSchemaBrowser::doExtension(xercesc::AttributeList& attrs) {
     }
 }
 
-void ZrXmlSchemaBrowser::finishExtension() {}
-
 // "group" and "attributeGroup" alike: a reference becomes an entry of the
 // enclosing content (or a top-level entry); anything else opens a definition.
-void ZrXmlSchemaBrowser::doGroup(xercesc::AttributeList& attrs) {
+void SchemaReader::doGroup(xercesc::AttributeList& attrs) {
     ZrName groupName;
     ZrName groupNs;
     ZrName refName;
@@ -111,7 +104,7 @@ void ZrXmlSchemaBrowser::doGroup(xercesc::AttributeList& attrs) {
         if (complexDepth != 0)
             currentComplexType.content.push_back(std::move(reference));
         else
-            globalElements.push_back(std::move(reference));
+            model.globalElements.push_back(std::move(reference));
         groupOpenedDefinition.push_back(false);
         return;
     }
@@ -122,7 +115,7 @@ void ZrXmlSchemaBrowser::doGroup(xercesc::AttributeList& attrs) {
     currentComplexType.name = std::move(groupName);
     currentComplexType.nameNs = std::move(groupNs);
     currentComplexType.isGroup = true;
-    nameIfAnonymous(currentComplexType.name, anonCounter);
+    nameIfAnonymous(currentComplexType.name, model.anonCount);
     ++complexDepth;
     groupOpenedDefinition.push_back(true);
 }
@@ -130,20 +123,15 @@ void ZrXmlSchemaBrowser::doGroup(xercesc::AttributeList& attrs) {
 // Closes a definition only if this element's own start opened one: the end of a
 // reference, even one standing directly inside a group definition, closes
 // nothing.
-void ZrXmlSchemaBrowser::finishGroup() {
+void SchemaReader::finishGroup() {
     if (groupOpenedDefinition.empty())
         return;
     const bool openedDefinition = groupOpenedDefinition.back();
     groupOpenedDefinition.pop_back();
     if (!openedDefinition || complexTypeStack.empty())
         return;
-    complexTypes.push_back(std::move(currentComplexType));
+    model.complexTypes.push_back(std::move(currentComplexType));
     currentComplexType = std::move(complexTypeStack.back());
     complexTypeStack.pop_back();
     --complexDepth;
-}
-
-ComplexTypeDef* ZrXmlSchemaBrowser::findComplexType(std::u16string_view localName,
-                                                    std::u16string_view namespaceURI) {
-    return complexTypes.find(localName, namespaceURI);
 }

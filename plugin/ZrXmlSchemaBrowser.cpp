@@ -1,0 +1,45 @@
+#include "ZrXmlSchemaBrowser.h"
+
+#include "RecordBuilder.h"
+#include "SchemaReader.h"
+#include "zrglob.h"
+
+#include <new>
+#include <xercesc/util/OutOfMemoryException.hpp>
+#include <xercesc/util/PlatformUtils.hpp>
+#include <xercesc/util/XMLException.hpp>
+#include <xercesc/util/XMLUni.hpp>
+
+ZrXmlSchemaBrowser::ZrXmlSchemaBrowser() {
+    try {
+        xercesc::XMLPlatformUtils::Initialize(xercesc::XMLUni::fgXercescDefaultLocale, nullptr,
+                                              nullptr, nullptr);
+    } catch (const xercesc::XMLException& e) {
+        initialised = false;
+        ZrXmlUtils::XMLChToWchar(e.getMessage(), initError, false);
+    }
+}
+
+// The parser library stays initialised: other browsers and the host may use it.
+ZrXmlSchemaBrowser::~ZrXmlSchemaBrowser() = default;
+
+bool ZrXmlSchemaBrowser::ReadSchema(const ZrWChar* path, bool qualified) {
+    if (!initialised) {
+        ZrGlob::LogMessage(ZR_SEV_ERROR, BE_READ_FAILED,
+                           lgettext(u"SchemaBrowser: Initialization error: %s"), initError.c_str());
+        return false;
+    }
+    records.Clear();
+    SchemaReader reader(model);
+    try {
+        if (!reader.read(path))
+            return false;
+        RecordBuilder builder(model, builtins, records, qualified);
+        return builder.build();
+    } catch (const xercesc::OutOfMemoryException&) {
+        reader.logOutOfMemory();
+    } catch (const std::bad_alloc&) {
+        reader.logOutOfMemory();
+    }
+    return false;
+}

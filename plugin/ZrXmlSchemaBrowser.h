@@ -1,0 +1,40 @@
+// One read of a schema: the reader fills a component model from the schema and the
+// documents it includes, then the builder makes host records from the model.
+#pragma once
+
+#include "BuiltinTypes.h"
+#include "SchemaModel.h"
+#include "zrapi.h"
+#include "zrbxmls_export.h"
+#include "zrdtype.h"
+#include "zrstring.h"
+
+class ZRBXMLS_API ZrXmlSchemaBrowser {
+  public:
+    ZrXmlSchemaBrowser();
+    ZrXmlSchemaBrowser(const ZrXmlSchemaBrowser&) = delete;
+    ZrXmlSchemaBrowser& operator=(const ZrXmlSchemaBrowser&) = delete;
+    ~ZrXmlSchemaBrowser();
+
+    // Parses the schema at `path` and the documents it includes, then builds one
+    // record per top-level declaration of complex type. False when the read failed;
+    // the cause has been logged.
+    bool ReadSchema(const ZrWChar* path, bool qualified);
+
+    // Records of the latest read, in building order; they live as long as the browser.
+    const ZrRecordList& Records() const { return records; }
+
+    // Moves the records of the latest read to the end of `target`; the browser keeps
+    // none. Throws bad_alloc, nothing moved, when memory runs out.
+    void TakeRecords(ZrRecordList& target) { target.TakeAll(records); }
+
+    // The component model of the latest read.
+    const SchemaModel& Model() const { return model; }
+
+  private:
+    bool initialised = true;
+    ZrWString initError;
+    BuiltinTypes builtins;
+    SchemaModel model;
+    ZrRecordList records;
+};

@@ -1,0 +1,211 @@
+// The schema reader: the SAX handler that parses a schema and the documents it
+// includes into a component model.
+#pragma once
+
+#include "SchemaModel.h"
+#include "zrfile.h"
+#include "zrstring.h"
+
+#include <cstdint>
+#include <deque>
+#include <map>
+#include <memory>
+#include <string_view>
+#include <type_traits>
+#include <unordered_map>
+#include <unordered_set>
+#include <utility>
+#include <vector>
+#include <xercesc/sax/AttributeList.hpp>
+#include <xercesc/sax/HandlerBase.hpp>
+#include <xercesc/sax/SAXParseException.hpp>
+
+static_assert(std::is_same_v<XMLCh, char16_t>, "the host's wide text must be the parser's XMLCh");
+
+// The parser's text as a view; null reads as the empty text.
+inline std::u16string_view xmlText(const XMLCh* text) {
+    return text ? std::u16string_view(text) : std::u16string_view();
+}
+
+// An attribute name as the parser gives it, compared without measuring it first:
+// most differ from the name sought in their first unit.
+class XmlName {
+  public:
+    explicit XmlName(const XMLCh* text) : text_(text ? text : u"") {}
+
+    // Stops at the first unit that differs, the terminator included.
+    bool startsWith(std::u16string_view prefix) const {
+        for (size_t i = 0; i < prefix.size(); ++i) {
+            if (text_[i] != prefix[i])
+                return false;
+        }
+        return true;
+    }
+
+    bool operator==(std::u16string_view name) const {
+        return startsWith(name) && text_[name.size()] == u'\0';
+    }
+
+    bool operator!=(std::u16string_view name) const { return !(*this == name); }
+
+  private:
+    const XMLCh* text_;
+};
+
+// A qualified name as the parser gives it, split at its first colon in one pass.
+struct XmlQualifiedName {
+    explicit XmlQualifiedName(const XMLCh* text) {
+        const XMLCh* p = text ? text : u"";
+        // Up to the first colon, then on to the end with nothing left to test for.
+        const XMLCh* end = p;
+        while (*end && *end != u':')
+            ++end;
+        const XMLCh* colon = *end ? end : nullptr;
+        while (*end)
+            ++end;
+        if (colon) {
+            prefix = std::u16string_view(p, size_t(colon - p));
+            local = std::u16string_view(colon + 1, size_t(end - colon - 1));
+        } else {
+            local = std::u16string_view(p, size_t(end - p));
+        }
+    }
+
+    bool prefixed() const { return prefix.data() != nullptr; }
+
+    std::u16string_view prefix; // null data when there is no colon
+    std::u16string_view local;  // null-terminated where the name is
+};
+
+XERCES_CPP_NAMESPACE_BEGIN
+class SAXParser;
+XERCES_CPP_NAMESPACE_END
+
+class SchemaReader : public xercesc::HandlerBase {
+  public:
+    // Fills `model`, which must outlive the reader.
+    explicit SchemaReader(SchemaModel& model);
+    SchemaReader(const SchemaReader&) = delete;
+    SchemaReader& operator=(const SchemaReader&) = delete;
+    ~SchemaReader() override;
+
+    // Empties the model, then parses the schema at `path` and the documents it
+    // includes into it. False when the read failed; the cause has been logged. The
+    // parser library must be initialised.
+    bool read(const ZrWChar* path);
+
+    // The document being read, or the last one read; named in messages.
+    const ZrWString& documentPath() const { return documentPath_; }
+
+    // Logs that memory ran out while reading or building from the document read.
+    void logOutOfMemory();
+
+    // Whether the document being read has failed so far.
+    bool hasFailed() const { return failed; }
+
+    // SAX callbacks.
+    void startElement(const XMLCh* name, xercesc::AttributeList& attrs) override;
+    void endElement(const XMLCh* name) override;
+    void warning(const xercesc::SAXParseException& e) override;
+    void error(const xercesc::SAXParseException& e) override;
+    void fatalError(const xercesc::SAXParseException& e) override;
+    // Refuses every external entity and DTD: nothing outside the schema documents
+    // themselves is ever read.
+    xercesc::InputSource* resolveEntity(const XMLCh* publicId, const XMLCh* systemId) override;
+
+    // Namespaces and qualified names, as the documents read so far declare them.
+    void FirstElementAttrs(xercesc::AttributeList& attrs);
+    void parseName(const XMLCh* name, bool useDefault, ZrName& localPart, ZrName& ns);
+
+  private:
+    // The namespace bound to `prefix`, or null when none is.
+    const std::u16string* namespaceOfPrefix(std::u16string_view prefix);
+    // The pool's copy of a namespace's text.
+    ZrName namespaceName(std::u16string_view uri);
+
+    // Handlers of schema constructs.
+    void doElement(xercesc::AttributeList& attrs, bool isAttribute);
+    void finishElement();
+    void doComplexType(xercesc::AttributeList& attrs);
+    void beginTypeDefinition(xercesc::AttributeList& attrs, SimpleTypeDef& type);
+    void finishComplexType();
+    void doExtension(xercesc::AttributeList& attrs);
+    void doGroup(xercesc::AttributeList& attrs);
+    void finishGroup();
+    void doSimpleType(xercesc::AttributeList& attrs);
+    void finishSimpleType();
+    void doRestriction(xercesc::AttributeList& attrs);
+    void doList(xercesc::AttributeList& attrs);
+    void doFacet(xercesc::AttributeList& attrs, SimpleTypeDef& type, const XMLCh* facetName);
+    void doInclude(xercesc::AttributeList& attrs);
+
+    // Start actions of the dispatch that need more than the attributes; they read
+    // the tag's local part from tagLocal.
+    void doElementTag(xercesc::AttributeList& attrs);
+    void doAttributeTag(xercesc::AttributeList& attrs);
+    void doFacetTag(xercesc::AttributeList& attrs);
+    void doSimpleContent(xercesc::AttributeList& attrs);
+    void doComplexContent(xercesc::AttributeList& attrs);
+    void skipSubtree(xercesc::AttributeList& attrs);
+    // Logs and fails a document that nests declarations, types and groups deeper
+    // than the reader keeps state for; the rest of the subtree is skipped.
+    bool tooDeep();
+
+    // Parse driver steps.
+    // Appends a location to documentQueue unless the read has queued it already.
+    bool queueDocument(const ZrWString& location);
+    // Parses documentPath_; any failure, thrown or reported, sets `failed`.
+    void parseDocument(xercesc::SAXParser& parser);
+    void logParseStopped(const XMLCh* message);
+
+    SchemaModel& model;
+
+    // Parse driver state.
+    bool failed = false;
+    bool firstElement = true;
+    int32_t skipDepth = 0;
+
+    // Components under construction.
+    ElementDef currentElement;
+    std::vector<ElementDef> elementStack;
+    ComplexTypeDef currentComplexType;
+    std::vector<ComplexTypeDef> complexTypeStack;
+    int32_t complexDepth = 0;
+    SimpleTypeDef currentSimpleType;
+    SimpleTypeDef* typeTarget = nullptr;
+
+    // The latest answers of namespaceOfPrefix; the URIs live in the table's nodes.
+    struct RecentPrefix {
+        std::u16string prefix;
+        const std::u16string* uri = nullptr;
+        bool used = false;
+    };
+
+    RecentPrefix recentPrefixes[2];
+    size_t nextRecentPrefix = 0;
+    bool recentPrefixesStale = true;
+    size_t recentPrefixesTableSize = 0;
+    std::u16string schemaNamespace;
+
+    // Scratch text of the current tag and attribute.
+    ZrWString nameBuffer;
+    ZrWString valueBuffer;
+    ZrName recentNamespaces[4];
+    size_t nextRecentNamespace = 0;
+
+    std::deque<ZrWString> documentQueue;
+    ZrURI documentURI;
+    // Path of the document being parsed, as queued; named in messages.
+    ZrWString documentPath_;
+    // Local part of the tag being dispatched, inside the parser's own name (and
+    // null-terminated there), and its namespace when a notice names it.
+    std::u16string_view tagLocal;
+    ZrWString tagNamespace;
+
+    // For each open "group"/"attributeGroup" element: whether its start opened a
+    // definition (true) or was a reference (false).
+    std::vector<bool> groupOpenedDefinition;
+    // Every location queued during the current read, so a document is parsed once
+    // however often it is included.
+    std::unordered_set<ZrWString> queuedDocuments;
+};
