@@ -204,9 +204,7 @@ bool RecordBuilder::addSimpleContentField(const ComplexTypeDef& type, const ZrWS
     ZrWString field = qualifiedName(declaration.nameNs, declaration.name, false);
     ZrDType dataType;
     if (!resolver.typeOfSimpleType(text, dataType)) {
-        ZrGlob::LogMessage(ZR_SEV_ERROR, 0,
-                           lgettext(u"Lookup of type '%s' (ns '%s') failed for field '%s'"),
-                           text.name.c_str(), u"", field.c_str());
+        logLookupFailure(text.name.view(), {}, field);
         return false;
     }
     newSimpleField(declaration, dataType, std::move(field), record);
@@ -329,15 +327,25 @@ bool RecordBuilder::fieldType(const ElementDef& declaration, const ZrWString& fi
     const std::u16string_view local =
         declaration.typeName.empty() ? u"string" : declaration.typeName.view();
     if (!resolver.lookupType(local, declaration.typeNs.view(), type)) {
-        const ZrWString localText(local);
-        ZrGlob::LogMessage(ZR_SEV_ERROR, 0,
-                           lgettext(u"Lookup of type '%s' (ns '%s') failed for field '%s'"),
-                           localText.c_str(), declaration.typeNs.c_str(), field.c_str());
+        logLookupFailure(local, declaration.typeNs.view(), field);
         return false;
     }
     fieldTypes.emplace(FieldTypeKey{declaration.typeName.identity(), declaration.typeNs.identity()},
                        FieldTypeEntry{declaration.typeName, declaration.typeNs, type});
     return true;
+}
+
+// The namespace is shown as it reads back from the type's name written with its
+// prefix: one that has no prefix of its own reads as the default namespace.
+void RecordBuilder::logLookupFailure(std::u16string_view local, std::u16string_view ns,
+                                     const ZrWString& field) const {
+    const ZrWString localText(local);
+    const ZrWString nsText(prefixes.prefixOf(ns, true).empty()
+                               ? std::u16string_view(model.namespaces.defaultNamespace)
+                               : ns);
+    ZrGlob::LogMessage(ZR_SEV_ERROR, 0,
+                       lgettext(u"Lookup of type '%s' (ns '%s') failed for field '%s'"),
+                       localText.c_str(), nsText.c_str(), field.c_str());
 }
 
 const ZrDType* RecordBuilder::keptFieldType(const ElementDef& declaration) const {

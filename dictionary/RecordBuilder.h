@@ -42,6 +42,8 @@ class RecordBuilder {
     bool addSimpleField(const ElementDef& declaration, ZrRecord* record, const ZrDType* kept);
     bool fieldType(const ElementDef& declaration, const ZrWString& field, ZrDType& type);
     const ZrDType* keptFieldType(const ElementDef& declaration) const;
+    void logLookupFailure(std::u16string_view local, std::u16string_view ns,
+                          const ZrWString& field) const;
     // Adds a field of `type` and notes its name.
     void newSimpleField(const ElementDef& declaration, ZrDType type, ZrWString field,
                         ZrRecord* record);
