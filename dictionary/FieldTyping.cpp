@@ -139,7 +139,9 @@ bool TypeResolver::resolveSimpleType(const SimpleTypeDef& simpleType, ZrDType& t
     bool based = false;
     if (!depth_.tooDeep(simpleType.name.c_str())) {
         resolving_.insert(&simpleType);
-        based = lookupType(simpleType.baseName.view(), simpleType.baseNs.view(), type);
+        based = simpleType.isUnion
+                    ? resolveUnion(simpleType, type)
+                    : lookupType(simpleType.baseName.view(), simpleType.baseNs.view(), type);
         resolving_.erase(&simpleType);
     }
     --depth_.open;
@@ -165,6 +167,46 @@ bool TypeResolver::resolveSimpleType(const SimpleTypeDef& simpleType, ZrDType& t
         dtPattern(type, simpleType.pattern.c_str());
     if (simpleType.maxEnumLength != 0)
         type.Length(simpleType.maxEnumLength);
+    return true;
+}
+
+// Members that all come to one built-in type give that type, with the largest
+// length, precision and decimal places of the members, or none where a member has
+// none; members of several types give text, as long as the longest member when every
+// member has a length.
+bool TypeResolver::resolveUnion(const SimpleTypeDef& simpleType, ZrDType& type) {
+    bool first = true;
+    bool common = true;
+    long length = 0;
+    long precision = 0;
+    short decimals = 0;
+    bool allLength = true;
+    bool allPrecision = true;
+    bool allDecimals = true;
+    for (const TypeRef& member : simpleType.memberTypes) {
+        ZrDType memberType;
+        if (!lookupType(member.name.view(), member.ns.view(), memberType))
+            return false;
+        if (first)
+            type = memberType;
+        else if (memberType.Usage() != type.Usage())
+            common = false;
+        first = false;
+        allLength = allLength && memberType.Length() > 0;
+        allPrecision = allPrecision && memberType.Precision() > 0;
+        allDecimals = allDecimals && memberType.DecimalPlaces() > 0;
+        length = std::max(length, memberType.Length());
+        precision = std::max(precision, memberType.Precision());
+        decimals = std::max(decimals, memberType.DecimalPlaces());
+    }
+    if (first || !common) {
+        type = *builtins_.builtinByName(u"string");
+        type.Length(allLength && !first ? length : 0);
+        return true;
+    }
+    type.Length(allLength ? length : 0);
+    type.Precision(allPrecision ? precision : 0);
+    type.DecimalPlaces(allDecimals ? decimals : 0);
     return true;
 }
 

@@ -40,6 +40,7 @@ class TypeResolver {
 
   private:
     bool resolveSimpleType(const SimpleTypeDef& simpleType, ZrDType& type);
+    bool resolveUnion(const SimpleTypeDef& simpleType, ZrDType& type);
 
     const SchemaModel& model_;
     const BuiltinTypes& builtins_;

@@ -31,6 +31,8 @@ void SimpleTypeDef::clear() {
     period.clear();
     duration.clear();
     maxEnumLength = 0;
+    isUnion = false;
+    memberTypes.clear();
 }
 
 void ComplexTypeDef::clear() {

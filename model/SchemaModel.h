@@ -36,7 +36,14 @@ class ElementDef {
     void clear();
 };
 
-// One simple type with its base and facets (facet values as written).
+// A component named by its (local name, namespace) pair.
+struct TypeRef {
+    ZrName name;
+    ZrName ns;
+};
+
+// One simple type with its base and facets (facet values as written), or a union of
+// member types.
 class SimpleTypeDef {
   public:
     ZrName name;
@@ -57,6 +64,9 @@ class SimpleTypeDef {
     ZrName period;
     ZrName duration;
     int32_t maxEnumLength = 0;
+    // A union: its values are those of its member types, named or nested, in order.
+    bool isUnion = false;
+    std::vector<TypeRef> memberTypes;
 
     SimpleTypeDef() = default;
     SimpleTypeDef(const SimpleTypeDef&) = default;
@@ -65,7 +75,7 @@ class SimpleTypeDef {
     SimpleTypeDef& operator=(SimpleTypeDef&&) noexcept = default;
     virtual ~SimpleTypeDef() = default;
 
-    // Empties every name and facet and resets maxEnumLength.
+    // Empties every name, facet and member type and resets maxEnumLength.
     virtual void clear();
 };
 

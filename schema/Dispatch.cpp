@@ -49,7 +49,7 @@ void SchemaReader::startElement(const XMLCh* name, xercesc::AttributeList& attrs
         Action act;
     };
 
-    // First match acts; names not listed (compositors, wildcards, unions, imports)
+    // First match acts; names not listed (compositors, wildcards, imports)
     // do nothing and their content is dispatched as usual.
     static constexpr StartAction kStartTable[] = {
         {u"schema", nullptr}, // its attributes and namespace are taken above
@@ -64,6 +64,7 @@ void SchemaReader::startElement(const XMLCh* name, xercesc::AttributeList& attrs
         {u"simpleType", &SchemaReader::doSimpleType},
         {u"restriction", &SchemaReader::doRestriction},
         {u"list", &SchemaReader::doList},
+        {u"union", &SchemaReader::doUnion},
         {u"include", &SchemaReader::doInclude},
         {u"extension", &SchemaReader::doExtension},
         {u"simpleContent", &SchemaReader::doSimpleContent},
@@ -161,7 +162,7 @@ void SchemaReader::doComplexContent(xercesc::AttributeList&) {
 }
 
 bool SchemaReader::tooDeep() {
-    if (elementStack.size() + complexTypeStack.size() < kMaxOpenComponents)
+    if (elementStack.size() + complexTypeStack.size() + simpleTypeStack.size() < kMaxOpenComponents)
         return false;
     if (!failed)
         ZrGlob::LogMessage(

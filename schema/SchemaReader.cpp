@@ -94,6 +94,9 @@ bool SchemaReader::read(const ZrWChar* path) {
     currentComplexType.clear();
     complexDepth = 0;
     currentSimpleType.clear();
+    currentDerivation = Derivation::None;
+    simpleTypeStack.clear();
+    simpleDepth = 0;
     typeTarget = nullptr;
     groupOpenedDefinition.clear();
     for (ZrName& recent : recentNamespaces)

@@ -136,6 +136,7 @@ class SchemaReader : public xercesc::HandlerBase {
     void finishSimpleType();
     void doRestriction(xercesc::AttributeList& attrs);
     void doList(xercesc::AttributeList& attrs);
+    void doUnion(xercesc::AttributeList& attrs);
     void doFacet(xercesc::AttributeList& attrs, SimpleTypeDef& type, const XMLCh* facetName);
     void doInclude(xercesc::AttributeList& attrs);
 
@@ -173,6 +174,19 @@ class SchemaReader : public xercesc::HandlerBase {
     int32_t complexDepth = 0;
     SimpleTypeDef currentSimpleType;
     SimpleTypeDef* typeTarget = nullptr;
+    // How the open simple type derives, which decides what a simple type nested in
+    // it becomes: its base (restriction), a member (union) or nothing (list).
+    enum class Derivation : uint8_t { None, Restriction, List, Union };
+    Derivation currentDerivation = Derivation::None;
+
+    // Simple types open around the working one, innermost last.
+    struct OpenSimpleType {
+        SimpleTypeDef type;
+        Derivation derivation;
+    };
+
+    std::vector<OpenSimpleType> simpleTypeStack;
+    int32_t simpleDepth = 0;
 
     // The latest answers of namespaceOfPrefix; the URIs live in the table's nodes.
     struct RecentPrefix {

@@ -2,26 +2,57 @@
 #include "zrglob.h"
 
 #include <climits>
+#include <string>
 #include <string_view>
 
-// Simple types do not nest: a simple type starting inside another replaces the
-// working record, and the outer one's end stores what the inner one left.
+namespace {
+
+bool isXmlSpace(char16_t c) { return c == u' ' || c == u'\t' || c == u'\n' || c == u'\r'; }
+
+} // namespace
+
+// A simple type inside another's restriction, list or union is a type of its own;
+// the outer one waits on the stack until the inner one ends.
 void SchemaReader::doSimpleType(xercesc::AttributeList& attrs) {
+    if (tooDeep())
+        return;
+    if (simpleDepth != 0)
+        simpleTypeStack.push_back({std::move(currentSimpleType), currentDerivation});
+    ++simpleDepth;
     currentSimpleType.clear();
+    currentDerivation = Derivation::None;
     typeTarget = &currentSimpleType;
     beginTypeDefinition(attrs, currentSimpleType);
 }
 
-// The working record stays filled: facets met before the next simple type still
-// land in it, and an enclosing simple type stores it once more.
+// Stores the simple type. A nested one becomes the base of the restriction or a
+// member of the union it stands in, and the outer type is worked on again. After
+// the outermost one the working record stays filled: facets met before the next
+// simple type still land in it.
 void SchemaReader::finishSimpleType() {
     model.simpleTypes.push_back(currentSimpleType);
-    typeTarget = &currentComplexType;
+    if (simpleDepth == 0 || --simpleDepth == 0) {
+        typeTarget = &currentComplexType;
+        return;
+    }
+    TypeRef inner{currentSimpleType.name, currentSimpleType.nameNs};
+    currentSimpleType = std::move(simpleTypeStack.back().type);
+    currentDerivation = simpleTypeStack.back().derivation;
+    simpleTypeStack.pop_back();
+    typeTarget = &currentSimpleType;
+    if (currentDerivation == Derivation::Restriction && currentSimpleType.baseName.empty()) {
+        currentSimpleType.baseName = std::move(inner.name);
+        currentSimpleType.baseNs = std::move(inner.ns);
+    } else if (currentDerivation == Derivation::Union) {
+        currentSimpleType.memberTypes.push_back(std::move(inner));
+    }
 }
 
-// Before the browser has met any complex or simple type there is nothing to
-// restrict: the base is dropped.
+// Before the reader has met any complex or simple type there is nothing to restrict:
+// the base is dropped.
 void SchemaReader::doRestriction(xercesc::AttributeList& attrs) {
+    if (simpleDepth != 0)
+        currentDerivation = Derivation::Restriction;
     for (XMLSize_t i = 0; i < attrs.getLength(); ++i) {
         if (XmlName(attrs.getName(i)) != u"base" || !typeTarget)
             continue;
@@ -29,12 +60,44 @@ void SchemaReader::doRestriction(xercesc::AttributeList& attrs) {
     }
 }
 
-// A list types its values as text; its item type, named or inline, plays no part,
-// so its content is skipped together with its end tag.
+// A list types its values as text; its item type, named or nested, plays no part.
+// Outside any simple type its content is skipped.
 void SchemaReader::doList(xercesc::AttributeList&) {
     if (typeTarget)
         parseName(u"string", true, typeTarget->baseName, typeTarget->baseNs);
-    ++skipDepth;
+    if (simpleDepth != 0)
+        currentDerivation = Derivation::List;
+    else
+        ++skipDepth;
+}
+
+// The member types named by "memberTypes"; the simple types nested in the union
+// join them as they end.
+void SchemaReader::doUnion(xercesc::AttributeList& attrs) {
+    if (simpleDepth == 0)
+        return;
+    currentDerivation = Derivation::Union;
+    currentSimpleType.isUnion = true;
+    for (XMLSize_t i = 0; i < attrs.getLength(); ++i) {
+        if (XmlName(attrs.getName(i)) != u"memberTypes")
+            continue;
+        const std::u16string_view list = xmlText(attrs.getValue(i));
+        size_t pos = 0;
+        while (pos < list.size()) {
+            while (pos < list.size() && isXmlSpace(list[pos]))
+                ++pos;
+            size_t end = pos;
+            while (end < list.size() && !isXmlSpace(list[end]))
+                ++end;
+            if (end > pos) {
+                const std::u16string member(list.substr(pos, end - pos));
+                TypeRef ref;
+                parseName(member.c_str(), true, ref.name, ref.ns);
+                currentSimpleType.memberTypes.push_back(std::move(ref));
+            }
+            pos = end;
+        }
+    }
 }
 
 void SchemaReader::doFacet(xercesc::AttributeList& attrs, SimpleTypeDef& type,

@@ -67,6 +67,11 @@ inline std::string dumpTypeParts(const SimpleTypeDef& t) {
     }
     if (t.maxEnumLength != 0)
         out += " enum=" + std::to_string(t.maxEnumLength);
+    if (t.isUnion) {
+        out += " union=";
+        for (size_t i = 0; i < t.memberTypes.size(); ++i)
+            out += (i ? "," : "") + qname(t.memberTypes[i].name, t.memberTypes[i].ns);
+    }
     return out;
 }
 

@@ -211,23 +211,29 @@ const ModelCase kModelCases[] = {
      "  attribute name={urn:t}a type=anon1\n"
      "simpleType anon1 base={xs}string maxLength=5\n",
      ""},
-    {"ListsAreStringsAndTheirContentIsSkipped", kTns,
+    {"ListsAreStringsAndTheirItemTypesTypesOfTheirOwn", kTns,
      R"(<xs:simpleType name="L"><xs:list itemType="xs:int"/></xs:simpleType>
         <xs:simpleType name="L2"><xs:list><xs:simpleType><xs:restriction base="xs:int"/>
           </xs:simpleType></xs:list></xs:simpleType>
         <xs:element name="e"><xs:simpleType><xs:restriction base="xs:int"/></xs:simpleType>
         </xs:element>)",
-     "global element name={urn:t}e type=anon0\n"
+     "global element name={urn:t}e type=anon1\n"
      "simpleType {urn:t}L base=string\n"
+     "simpleType anon0 base={xs}int\n"
      "simpleType {urn:t}L2 base=string\n"
-     "simpleType anon0 base={xs}int\n",
+     "simpleType anon1 base={xs}int\n",
      ""},
-    {"NestedSimpleTypeReplacesTheOuterOne", "",
-     R"(<xs:simpleType name="U"><xs:union memberTypes="xs:int xs:string"><xs:simpleType>
+    {"NestedSimpleTypesAreTypesOfTheirOwn", "",
+     R"(<xs:simpleType name="U"><xs:union memberTypes="xs:int  xs:string"><xs:simpleType>
           <xs:restriction base="xs:int"><xs:maxInclusive value="9"/></xs:restriction>
-        </xs:simpleType></xs:union></xs:simpleType>)",
+        </xs:simpleType></xs:union></xs:simpleType>
+        <xs:simpleType name="R"><xs:restriction><xs:simpleType><xs:restriction base="xs:string">
+          <xs:maxLength value="5"/></xs:restriction></xs:simpleType><xs:maxLength value="3"/>
+        </xs:restriction></xs:simpleType>)",
      "simpleType anon0 base={xs}int maxInclusive=9\n"
-     "simpleType anon0 base={xs}int maxInclusive=9\n",
+     "simpleType U union={xs}int,{xs}string,anon0\n"
+     "simpleType anon1 base={xs}string maxLength=5\n"
+     "simpleType R base=anon1 maxLength=3\n",
      ""},
     {"FacetsOfComplexContentRestrictionStayOffTheType", "",
      R"(<xs:simpleType name="S"><xs:restriction base="xs:string"><xs:maxLength value="4"/>
