@@ -90,7 +90,23 @@ bool BuildDepth::tooDeep(const char16_t* where) const {
 
 TypeResolver::TypeResolver(const SchemaModel& model, const BuiltinTypes& builtins,
                            BuildDepth& depth)
-    : model_(model), builtins_(builtins), depth_(depth) {}
+    : model_(model), builtins_(builtins), depth_(depth),
+      explained_(model.failedImports.size(), false) {}
+
+void TypeResolver::explainMissing(std::u16string_view ns) {
+    for (size_t i = 0; i < model_.failedImports.size(); ++i) {
+        const SchemaModel::ImportFailure& failure = model_.failedImports[i];
+        if (explained_[i] || failure.ns != ns)
+            continue;
+        explained_[i] = true;
+        const ZrWString nsText(failure.ns);
+        const ZrWString location(failure.location);
+        const ZrWString reason(failure.reason);
+        ZrGlob::LogMessage(ZR_SEV_ERROR, 4,
+                           lgettext(u"Import of namespace '%s' from '%s' was not read: %s"),
+                           nsText.c_str(), location.c_str(), reason.c_str());
+    }
+}
 
 bool TypeResolver::lookupType(std::u16string_view localName, std::u16string_view namespaceURI,
                               ZrDType& type) {
@@ -139,9 +155,13 @@ bool TypeResolver::resolveSimpleType(const SimpleTypeDef& simpleType, ZrDType& t
     bool based = false;
     if (!depth_.tooDeep(simpleType.name.c_str())) {
         resolving_.insert(&simpleType);
-        based = simpleType.isUnion
-                    ? resolveUnion(simpleType, type)
-                    : lookupType(simpleType.baseName.view(), simpleType.baseNs.view(), type);
+        if (simpleType.isUnion) {
+            based = resolveUnion(simpleType, type);
+        } else {
+            based = lookupType(simpleType.baseName.view(), simpleType.baseNs.view(), type);
+            if (!based)
+                explainMissing(simpleType.baseNs.view());
+        }
         resolving_.erase(&simpleType);
     }
     --depth_.open;

@@ -9,6 +9,7 @@
 #include <string_view>
 #include <unordered_map>
 #include <unordered_set>
+#include <vector>
 
 // Nested records, groups, element references, base types and simple-type bases
 // together may open this many levels. Real schemas stay far below it; the bound keeps
@@ -37,6 +38,9 @@ class TypeResolver {
     // The data type of `simpleType`, which need not be one of the model's: its base's
     // narrowed by its facets. False, logged, when its base chain fails.
     bool typeOfSimpleType(const SimpleTypeDef& simpleType, ZrDType& type);
+    // Something sought in `ns` was not found: says, once per read, why each document
+    // imported for that namespace could not be read.
+    void explainMissing(std::u16string_view ns);
 
   private:
     bool resolveSimpleType(const SimpleTypeDef& simpleType, ZrDType& type);
@@ -49,6 +53,8 @@ class TypeResolver {
     std::unordered_map<const SimpleTypeDef*, ZrDType> resolved_;
     // Simple types whose base chain is being resolved.
     std::unordered_set<const SimpleTypeDef*> resolving_;
+    // Which failed imports of the model have been explained.
+    std::vector<bool> explained_;
 };
 
 // Narrows a numeric type to the digits of its range facets.

@@ -82,7 +82,8 @@ RecordBuilder::RecordBuilder(const SchemaModel& schema, const BuiltinTypes& type
       prefixes(schema.namespaces), resolver(schema, types, depth), anonCounter(schema.anonCount) {}
 
 bool RecordBuilder::build() {
-    for (const ElementDef& declaration : model.globalElements) {
+    for (size_t i = 0; i < model.mainElementCount; ++i) {
+        const ElementDef& declaration = model.globalElements[i];
         const ComplexTypeDef* type =
             model.findComplexType(declaration.typeName.view(), declaration.typeNs.view());
         recordWorkList.clear();
@@ -128,6 +129,7 @@ ZrRecord* RecordBuilder::buildRecord(const ElementDef& declaration) {
     if (!type) {
         const ZrWString typeText = qualifiedName(declaration.typeNs, declaration.typeName, true);
         ZrGlob::LogMessage(ZR_SEV_ERROR, 4, "Unable to find complex type %S", typeText.c_str());
+        resolver.explainMissing(declaration.typeNs.view());
     } else {
         RecordScope scope(expansionStack, expansionFloor, type);
         built = addDerivedContent(*type, record->name, record);
@@ -254,6 +256,7 @@ bool RecordBuilder::addReference(const ElementDef& reference, ZrRecord* record) 
     if (!target) {
         ZrGlob::LogMessage(ZR_SEV_ERROR, 0, "Failed to look up ref to %S:%S",
                            reference.refNs.c_str(), reference.refName.c_str());
+        resolver.explainMissing(reference.refNs.view());
         return false;
     }
     if (isExpanding(target)) {
@@ -273,6 +276,7 @@ bool RecordBuilder::addGroup(const ElementDef& reference, ZrRecord* record) {
         model.findComplexType(reference.groupName.view(), reference.groupNs.view());
     if (!group) {
         ZrGlob::LogMessage(ZR_SEV_ERROR, 4, "Unable to find group %S", reference.groupName.c_str());
+        resolver.explainMissing(reference.groupNs.view());
         return false;
     }
     if (isExpanding(group)) {
@@ -338,7 +342,7 @@ bool RecordBuilder::fieldType(const ElementDef& declaration, const ZrWString& fi
 // The namespace is shown as it reads back from the type's name written with its
 // prefix: one that has no prefix of its own reads as the default namespace.
 void RecordBuilder::logLookupFailure(std::u16string_view local, std::u16string_view ns,
-                                     const ZrWString& field) const {
+                                     const ZrWString& field) {
     const ZrWString localText(local);
     const ZrWString nsText(prefixes.prefixOf(ns, true).empty()
                                ? std::u16string_view(model.namespaces.defaultNamespace)
@@ -346,6 +350,7 @@ void RecordBuilder::logLookupFailure(std::u16string_view local, std::u16string_v
     ZrGlob::LogMessage(ZR_SEV_ERROR, 0,
                        lgettext(u"Lookup of type '%s' (ns '%s') failed for field '%s'"),
                        localText.c_str(), nsText.c_str(), field.c_str());
+    resolver.explainMissing(ns);
 }
 
 const ZrDType* RecordBuilder::keptFieldType(const ElementDef& declaration) const {

@@ -43,7 +43,7 @@ class RecordBuilder {
     bool fieldType(const ElementDef& declaration, const ZrWString& field, ZrDType& type);
     const ZrDType* keptFieldType(const ElementDef& declaration) const;
     void logLookupFailure(std::u16string_view local, std::u16string_view ns,
-                          const ZrWString& field) const;
+                          const ZrWString& field);
     // Adds a field of `type` and notes its name.
     void newSimpleField(const ElementDef& declaration, ZrDType type, ZrWString field,
                         ZrRecord* record);

@@ -45,6 +45,9 @@ void ComplexTypeDef::clear() {
 PrefixWriter::PrefixWriter(const NamespaceBindings& bindings) : bindings_(bindings) {
     for (const auto& [prefix, bound] : bindings.prefixes)
         prefixOfUri_.emplace(bound, prefix); // keeps the first in table order
+    for (const auto& [bound, prefix] : bindings.importedPrefixes)
+        prefixOfUri_.emplace(bound, prefix);
+    prefixOfUri_.emplace(kXmlNamespace, u"xml");
 }
 
 std::u16string_view PrefixWriter::prefixOf(std::u16string_view uri, bool useTargetPrefix) const {
@@ -61,6 +64,8 @@ void SchemaModel::clear() {
     complexTypes.clear();
     simpleTypes.clear();
     namespaces.clear();
+    mainElementCount = 0;
+    failedImports.clear();
     anonCount = 0;
     names.clear();
 }

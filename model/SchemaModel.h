@@ -289,17 +289,24 @@ template <class T> class NamedList {
 // schema binds no prefix to it.
 inline constexpr std::u16string_view kTargetPrefix = u"zrxxxtrg";
 
+// The namespace that the prefix "xml" is bound to in every document.
+inline constexpr std::u16string_view kXmlNamespace = u"http://www.w3.org/XML/1998/namespace";
+
 // The namespace declarations in force: the default and target namespaces and the
 // prefixes bound to namespaces. Documents add to them as they are read.
 struct NamespaceBindings {
     std::u16string defaultNamespace;
     std::u16string targetNamespace;
     std::map<std::u16string, std::u16string, std::less<>> prefixes;
+    // Prefixes that imported documents bind, by namespace, the first one met for
+    // each: names of a namespace the schema binds no prefix to are written with one.
+    std::map<std::u16string, std::u16string, std::less<>> importedPrefixes;
 
     void clear() {
         defaultNamespace.clear();
         targetNamespace.clear();
         prefixes.clear();
+        importedPrefixes.clear();
     }
 };
 
@@ -312,7 +319,8 @@ class PrefixWriter {
 
     // The prefix of names in `uri`: kTargetPrefix for the target namespace when
     // `useTargetPrefix`, none for the default or target namespace, else the first
-    // prefix in table order bound to it, none when no prefix is.
+    // prefix in table order bound to it, else one an imported document binds to it,
+    // "xml" for the XML namespace, none otherwise.
     std::u16string_view prefixOf(std::u16string_view uri, bool useTargetPrefix) const;
 
   private:
@@ -325,7 +333,22 @@ struct SchemaModel {
     NamedList<ElementDef> globalElements;
     NamedList<ComplexTypeDef> complexTypes;
     NamedList<SimpleTypeDef> simpleTypes;
+    // The namespace declarations of the main schema (the main document and the
+    // documents it includes); imported documents have their own.
     NamespaceBindings namespaces;
+    // The top-level declarations of the main schema come first; those after them come
+    // from imported documents, which add components but no records of their own.
+    size_t mainElementCount = 0;
+
+    // Imported documents that could not be read: not an error until something is
+    // sought in their namespace.
+    struct ImportFailure {
+        std::u16string ns;
+        std::u16string location;
+        std::u16string reason;
+    };
+
+    std::vector<ImportFailure> failedImports;
     // Generated names ("anonN") handed out so far.
     int32_t anonCount = 0;
     // One shared copy of each name, namespace and facet value the model holds.

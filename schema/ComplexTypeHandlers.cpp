@@ -43,6 +43,11 @@ void SchemaReader::beginTypeDefinition(xercesc::AttributeList& attrs, SimpleType
         else if (attr == u"base")
             parseName(value, true, type.baseName, type.baseNs);
     }
+    referToOriginal(type.baseName, type.baseNs, false);
+    const bool topLevel = elementStack.empty() && complexDepth == 0 &&
+                          simpleDepth <= (&type == &currentSimpleType ? 1 : 0);
+    if (topLevel)
+        nameDefinition(type.name, type.nameNs, false);
     nameIfAnonymous(type.name, model.anonCount);
 
     // A type defined inside a declaration without a "type" attribute becomes its
@@ -73,6 +78,7 @@ void SchemaReader::doExtension(xercesc::AttributeList& attrs) {
         else if (attr == u"base")
             parseName(value, true, currentComplexType.baseName, currentComplexType.baseNs);
     }
+    referToOriginal(currentComplexType.baseName, currentComplexType.baseNs, false);
 }
 
 // "group" and "attributeGroup" alike: a reference becomes an entry of the
@@ -98,6 +104,7 @@ void SchemaReader::doGroup(xercesc::AttributeList& attrs) {
     }
 
     if (!refName.empty()) {
+        referToOriginal(refName, refNs, true);
         ElementDef reference;
         reference.groupName = std::move(refName);
         reference.groupNs = std::move(refNs);
@@ -111,6 +118,8 @@ void SchemaReader::doGroup(xercesc::AttributeList& attrs) {
 
     if (tooDeep())
         return;
+    if (elementStack.empty() && complexDepth == 0 && simpleDepth == 0)
+        nameDefinition(groupName, groupNs, true);
     saveComplexType(currentComplexType, complexTypeStack);
     currentComplexType.name = std::move(groupName);
     currentComplexType.nameNs = std::move(groupNs);

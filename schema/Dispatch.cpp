@@ -49,7 +49,7 @@ void SchemaReader::startElement(const XMLCh* name, xercesc::AttributeList& attrs
         Action act;
     };
 
-    // First match acts; names not listed (compositors, wildcards, imports)
+    // First match acts; names not listed (compositors, wildcards)
     // do nothing and their content is dispatched as usual.
     static constexpr StartAction kStartTable[] = {
         {u"schema", nullptr}, // its attributes and namespace are taken above
@@ -66,6 +66,8 @@ void SchemaReader::startElement(const XMLCh* name, xercesc::AttributeList& attrs
         {u"list", &SchemaReader::doList},
         {u"union", &SchemaReader::doUnion},
         {u"include", &SchemaReader::doInclude},
+        {u"import", &SchemaReader::doImport},
+        {u"redefine", &SchemaReader::doRedefine},
         {u"extension", &SchemaReader::doExtension},
         {u"simpleContent", &SchemaReader::doSimpleContent},
         {u"complexContent", &SchemaReader::doComplexContent},
@@ -90,6 +92,7 @@ void SchemaReader::startElement(const XMLCh* name, xercesc::AttributeList& attrs
         ++skipDepth;
         return;
     }
+    const bool first = firstElement;
     if (firstElement) {
         FirstElementAttrs(attrs);
         firstElement = false;
@@ -99,10 +102,19 @@ void SchemaReader::startElement(const XMLCh* name, xercesc::AttributeList& attrs
     const XmlQualifiedName tag(name);
     const std::u16string_view local = tag.local;
     const std::u16string* uri =
-        tag.prefixed() ? namespaceOfPrefix(tag.prefix) : &model.namespaces.defaultNamespace;
+        tag.prefixed() ? namespaceOfPrefix(tag.prefix) : &bindings->defaultNamespace;
     // The local part ends where the tag's name does, so it stays null-terminated.
     tagLocal = local;
     const std::u16string_view ns = uri ? std::u16string_view(*uri) : std::u16string_view();
+    if (first && currentDocument.imported && local != u"schema") {
+        ZrWString text;
+        wsfmt(text, lgettext(u"Schema: Error: File %s is not a schema document"),
+              documentPath_.c_str());
+        reportError(ZR_SEV_ERROR, 4, text);
+        failed = true;
+        skipDepth = 1;
+        return;
+    }
     if (local == u"schema")
         schemaNamespace = ns;
     if (!zrSameText(ns, schemaNamespace)) {
@@ -126,6 +138,7 @@ void SchemaReader::endElement(const XMLCh* name) {
         {u"element", &SchemaReader::finishElement},
         {u"attribute", &SchemaReader::finishElement},
         {u"complexType", &SchemaReader::finishComplexType},
+        {u"redefine", &SchemaReader::finishRedefine},
         {u"simpleType", &SchemaReader::finishSimpleType},
         {u"group", &SchemaReader::finishGroup},
         {u"attributeGroup", &SchemaReader::finishGroup},
@@ -164,11 +177,13 @@ void SchemaReader::doComplexContent(xercesc::AttributeList&) {
 bool SchemaReader::tooDeep() {
     if (elementStack.size() + complexTypeStack.size() + simpleTypeStack.size() < kMaxOpenComponents)
         return false;
-    if (!failed)
-        ZrGlob::LogMessage(
-            ZR_SEV_ERROR, 4,
-            lgettext(u"Schema: Error: Declarations and types nested deeper than %d in file %s"),
-            static_cast<int>(kMaxOpenComponents), documentPath_.c_str());
+    if (!failed) {
+        ZrWString text;
+        wsfmt(text,
+              lgettext(u"Schema: Error: Declarations and types nested deeper than %d in file %s"),
+              static_cast<int>(kMaxOpenComponents), documentPath_.c_str());
+        reportError(ZR_SEV_ERROR, 4, text);
+    }
     failed = true;
     skipDepth = 1;
     return true;

@@ -17,29 +17,37 @@ bool isAbsoluteLocation(const char* location) {
 
 } // namespace
 
-// Queues the included document; it is parsed after the current one. A relative
-// location is taken from the directory of the document that holds the include,
-// its own directory part kept.
+ZrWString SchemaReader::locationFromDocument(const ZrWString& written) const {
+    ZrWString location = written;
+    const ZrURI writtenURI(written.c_str());
+    if (documentURI.protocol() == ZRP_NONE && writtenURI.protocol() == ZRP_NONE &&
+        !isAbsoluteLocation(writtenURI.path())) {
+        ZrString directory(documentURI.path());
+        ZrString name;
+        ZrString extension;
+        ZrGlob::sepfile(directory, name, extension);
+        if (!directory.empty()) {
+            ZrGlob::appndnam(directory, writtenURI.path());
+            location.Assign(directory.c_str(), ZR_CSET_DEFAULT, -1);
+        }
+    }
+    return location;
+}
+
+// Queues the included document; it is parsed after the current one, as part of the
+// schema the current one belongs to. A relative location is taken from the
+// directory of the document that holds the include, its own directory part kept.
 void SchemaReader::doInclude(xercesc::AttributeList& attrs) {
     for (XMLSize_t i = 0; i < attrs.getLength(); ++i) {
         ZrXmlUtils::XMLChToWchar(attrs.getName(i), nameBuffer, false);
         if (nameBuffer.view() != u"schemaLocation")
             continue;
         ZrXmlUtils::XMLChToWchar(attrs.getValue(i), valueBuffer, false);
-
-        ZrWString location = valueBuffer;
-        const ZrURI includeURI(valueBuffer.c_str());
-        if (documentURI.protocol() == ZRP_NONE && includeURI.protocol() == ZRP_NONE &&
-            !isAbsoluteLocation(includeURI.path())) {
-            ZrString directory(documentURI.path());
-            ZrString name;
-            ZrString extension;
-            ZrGlob::sepfile(directory, name, extension);
-            if (!directory.empty()) {
-                ZrGlob::appndnam(directory, includeURI.path());
-                location.Assign(directory.c_str(), ZR_CSET_DEFAULT, -1);
-            }
-        }
-        queueDocument(location);
+        QueuedDocument included;
+        included.path = locationFromDocument(valueBuffer);
+        included.imported = currentDocument.imported;
+        included.ns = currentDocument.ns;
+        included.target = bindings->targetNamespace;
+        queueDocument(std::move(included));
     }
 }

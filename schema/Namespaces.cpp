@@ -4,11 +4,16 @@
 #include <iterator>
 #include <string_view>
 
+const std::u16string& SchemaReader::xmlNamespace() {
+    static const std::u16string uri(kXmlNamespace);
+    return uri;
+}
+
 // Only the first element of each document declares namespaces; its declarations
 // apply to its own name too, so they are read before that name is resolved.
 void SchemaReader::FirstElementAttrs(xercesc::AttributeList& attrs) {
     recentPrefixesStale = true;
-    NamespaceBindings& bindings = model.namespaces;
+    NamespaceBindings& declared = *bindings;
     for (XMLSize_t i = 0; i < attrs.getLength(); ++i) {
         ZrXmlUtils::XMLChToWchar(attrs.getName(i), nameBuffer, false);
         ZrXmlUtils::XMLChToWchar(attrs.getValue(i), valueBuffer, false);
@@ -16,11 +21,11 @@ void SchemaReader::FirstElementAttrs(xercesc::AttributeList& attrs) {
             // "xmlnsFoo" declares the default namespace as well: only a colon after
             // the five letters introduces a prefix.
             if (nameBuffer.length() > 5 && nameBuffer.view()[5] == u':')
-                bindings.prefixes[std::u16string(nameBuffer.view().substr(6))] = valueBuffer.view();
+                declared.prefixes[std::u16string(nameBuffer.view().substr(6))] = valueBuffer.view();
             else
-                bindings.defaultNamespace = valueBuffer.view();
+                declared.defaultNamespace = valueBuffer.view();
         } else if (nameBuffer.view() == u"targetNamespace") {
-            bindings.targetNamespace = valueBuffer.view();
+            declared.targetNamespace = valueBuffer.view();
         } else if (nameBuffer.view() == u"elementFormDefault" ||
                    nameBuffer.view() == u"attributeFormDefault" ||
                    nameBuffer.view() == u"version") {
@@ -34,10 +39,12 @@ void SchemaReader::FirstElementAttrs(xercesc::AttributeList& attrs) {
 
 void SchemaReader::parseName(const XMLCh* name, bool useDefault, ZrName& localPart, ZrName& ns) {
     const XmlQualifiedName text(name);
-    const NamespaceBindings& bindings = model.namespaces;
-    const std::u16string* uri = useDefault ? &bindings.defaultNamespace : &bindings.targetNamespace;
+    const std::u16string* uri =
+        useDefault ? &bindings->defaultNamespace : &bindings->targetNamespace;
     if (text.prefixed())
         uri = namespaceOfPrefix(text.prefix);
+    if (uri == &xmlNamespace())
+        usesXmlNamespace = true;
     // Both results are taken before either output changes, since the name may be
     // the text of one of them. An unknown prefix leaves no namespace: the empty text.
     ZrName foundNs = uri ? namespaceName(*uri) : ZrName();
@@ -63,21 +70,24 @@ ZrName SchemaReader::namespaceName(std::u16string_view uri) {
 // two prefixes: the last answers are kept, and forgotten when the table changes
 // (FirstElementAttrs, or a change in its size).
 const std::u16string* SchemaReader::namespaceOfPrefix(std::u16string_view prefix) {
-    const NamespaceBindings& bindings = model.namespaces;
+    const NamespaceBindings& declared = *bindings;
     if (prefix == kTargetPrefix)
-        return &bindings.targetNamespace;
-    if (recentPrefixesStale || recentPrefixesTableSize != bindings.prefixes.size()) {
+        return &declared.targetNamespace;
+    if (recentPrefixesStale || recentPrefixesTableSize != declared.prefixes.size()) {
         for (RecentPrefix& recent : recentPrefixes)
             recent.used = false;
-        recentPrefixesTableSize = bindings.prefixes.size();
+        recentPrefixesTableSize = declared.prefixes.size();
         recentPrefixesStale = false;
     }
     for (const RecentPrefix& recent : recentPrefixes) {
         if (recent.used && zrSameText(recent.prefix, prefix))
             return recent.uri;
     }
-    const auto it = bindings.prefixes.find(prefix);
-    const std::u16string* uri = it == bindings.prefixes.end() ? nullptr : &it->second;
+    const auto it = declared.prefixes.find(prefix);
+    // "xml" is bound in every document without being declared.
+    const std::u16string* uri = it != declared.prefixes.end() ? &it->second
+                                : prefix == u"xml"            ? &xmlNamespace()
+                                                              : nullptr;
     RecentPrefix& slot = recentPrefixes[nextRecentPrefix];
     nextRecentPrefix = (nextRecentPrefix + 1) % std::size(recentPrefixes);
     slot.prefix = prefix;

@@ -16,7 +16,7 @@
 using xercesc::SAXParseException;
 using xercesc::XMLPlatformUtils;
 
-SchemaReader::SchemaReader(SchemaModel& target) : model(target) {}
+SchemaReader::SchemaReader(SchemaModel& target) : model(target), bindings(&target.namespaces) {}
 
 SchemaReader::~SchemaReader() = default;
 
@@ -70,12 +70,33 @@ std::u16string normaliseLocation(std::u16string_view location) {
 
 } // namespace
 
-bool SchemaReader::queueDocument(const ZrWString& location) {
-    if (!queuedDocuments.insert(ZrWString(normaliseLocation(location.view()))).second)
+bool SchemaReader::queueDocument(QueuedDocument document) {
+    if (!queuedDocuments.insert(ZrWString(normaliseLocation(document.path.view()))).second)
         return false;
-    documentQueue.push_back(location);
+    (document.imported ? importQueue : documentQueue).push_back(std::move(document));
     return true;
 }
+
+namespace {
+
+// The XML namespace's attributes, read when the schema uses the namespace and no
+// document for it is imported.
+constexpr std::string_view kXmlNamespaceSchema =
+    R"(<xs:schema xmlns:xs="http://www.w3.org/2001/XMLSchema"
+           targetNamespace="http://www.w3.org/XML/1998/namespace">
+  <xs:attribute name="lang" type="xs:language"/>
+  <xs:attribute name="space"><xs:simpleType><xs:restriction base="xs:NCName">
+    <xs:enumeration value="default"/><xs:enumeration value="preserve"/>
+  </xs:restriction></xs:simpleType></xs:attribute>
+  <xs:attribute name="base" type="xs:anyURI"/>
+  <xs:attribute name="id" type="xs:ID"/>
+  <xs:attributeGroup name="specialAttrs">
+    <xs:attribute ref="xml:base"/><xs:attribute ref="xml:lang"/>
+    <xs:attribute ref="xml:space"/><xs:attribute ref="xml:id"/>
+  </xs:attributeGroup>
+</xs:schema>)";
+
+} // namespace
 
 bool SchemaReader::read(const ZrWChar* path) {
     auto parser = std::make_unique<SchemaParser>();
@@ -84,11 +105,94 @@ bool SchemaReader::read(const ZrWChar* path) {
     parser->setEntityResolver(this);
 
     model.clear();
+    bindings = &model.namespaces;
+    resetOpenComponents();
+    for (ZrName& recent : recentNamespaces)
+        recent.clear();
+    documentQueue.clear();
+    importQueue.clear();
+    queuedDocuments.clear();
+    usesXmlNamespace = false;
+    readXmlNamespace = false;
+    redefinitions.reset();
+    redefineDepth = 0;
+
+    QueuedDocument main;
+    main.path = path;
+    documentPath_ = path;
+    queueDocument(std::move(main));
+    if (!readQueue(*parser, documentQueue))
+        return false;
+    // What imported documents declare at the top level is theirs, not the schema's.
+    model.mainElementCount = model.globalElements.size();
+    readQueue(*parser, importQueue);
+    if (usesXmlNamespace && !readXmlNamespace) {
+        QueuedDocument xml;
+        xml.path = u"xml.xsd (built in)";
+        xml.imported = true;
+        xml.ns = kXmlNamespace;
+        xml.text = kXmlNamespaceSchema;
+        queueDocument(std::move(xml));
+        readQueue(*parser, importQueue);
+    }
+    return true;
+}
+
+bool SchemaReader::readQueue(xercesc::SAXParser& parser, std::deque<QueuedDocument>& queue) {
+    while (!queue.empty()) {
+        startDocument(queue.front());
+        queue.pop_front();
+        parseDocument(parser);
+        if (!currentDocument.imported) {
+            if (failed)
+                return false;
+            continue;
+        }
+        if (failed) {
+            noteFailedImport(importFailure);
+            continue;
+        }
+        // Names of this document's namespaces that the schema binds no prefix to are
+        // written with the prefix this document binds.
+        for (const auto& [prefix, uri] : importBindings.prefixes)
+            model.namespaces.importedPrefixes.emplace(uri, prefix);
+        if (importBindings.targetNamespace == kXmlNamespace)
+            readXmlNamespace = true;
+    }
+    return true;
+}
+
+void SchemaReader::startDocument(const QueuedDocument& document) {
+    currentDocument = document;
+    documentPath_ = document.path;
+    documentURI = documentPath_.c_str();
+    firstElement = true;
+    failed = false;
+    skipDepth = 0;
+    importFailure.clear();
     recentPrefixesStale = true;
+    if (!document.imported) {
+        bindings = &model.namespaces;
+        return;
+    }
+    // Each imported document starts afresh; one it includes takes its target namespace.
+    resetOpenComponents();
+    importBindings.clear();
+    importBindings.targetNamespace = document.target;
+    bindings = &importBindings;
+}
+
+void SchemaReader::noteFailedImport(const ZrWString& reason) {
+    model.failedImports.push_back(
+        {currentDocument.ns, std::u16string(documentPath_.view()), std::u16string(reason.view())});
+    resetOpenComponents();
+}
+
+void SchemaReader::resetOpenComponents() {
     elementStack.clear();
     currentElement.clear();
-    // A read that failed inside a non-nullable declaration must not hand that flag
-    // to the first declaration of this one.
+    // A document that failed inside a non-nullable declaration must not hand that flag
+    // to the first declaration of the next one.
     currentElement.nullable = true;
     complexTypeStack.clear();
     currentComplexType.clear();
@@ -99,26 +203,8 @@ bool SchemaReader::read(const ZrWChar* path) {
     simpleDepth = 0;
     typeTarget = nullptr;
     groupOpenedDefinition.clear();
-    for (ZrName& recent : recentNamespaces)
-        recent.clear();
-    documentQueue.clear();
-    queuedDocuments.clear();
-
-    documentPath_ = path;
-    queueDocument(documentPath_);
-
-    while (!documentQueue.empty()) {
-        firstElement = true;
-        failed = false;
-        skipDepth = 0;
-        documentPath_ = std::move(documentQueue.front());
-        documentQueue.pop_front();
-        documentURI = documentPath_.c_str();
-        parseDocument(*parser);
-        if (failed)
-            return false;
-    }
-    return true;
+    redefineDepth = 0;
+    recentPrefixesStale = true;
 }
 
 // Formatting the message may itself run out of memory; nothing may leave the read.
@@ -133,6 +219,13 @@ void SchemaReader::logOutOfMemory() {
 
 void SchemaReader::parseDocument(xercesc::SAXParser& parser) {
     try {
+        if (!currentDocument.text.empty()) {
+            const xercesc::MemBufInputSource source(
+                reinterpret_cast<const XMLByte*>(currentDocument.text.data()),
+                currentDocument.text.size(), documentPath_.c_str(), false);
+            parser.parse(source);
+            return;
+        }
         FPInputSource source(documentPath_.c_str());
         parser.parse(source);
         if (source.readFailed())
@@ -144,10 +237,10 @@ void SchemaReader::parseDocument(xercesc::SAXParser& parser) {
         logOutOfMemory();
         failed = true;
     } catch (const SchemaEntityTooLong& e) {
-        ZrGlob::LogMessage(
-            ZR_SEV_ERROR, 4,
-            lgettext(u"Schema: Error: Entity '%s' in file %s is longer than %d characters"),
-            e.name.c_str(), documentPath_.c_str(), static_cast<int>(kSchemaEntityValueLimit));
+        ZrWString text;
+        wsfmt(text, lgettext(u"Schema: Error: Entity '%s' in file %s is longer than %d characters"),
+              e.name.c_str(), documentPath_.c_str(), static_cast<int>(kSchemaEntityValueLimit));
+        reportError(ZR_SEV_ERROR, 4, text);
         failed = true;
     } catch (const xercesc::XMLException& e) {
         logParseStopped(e.getMessage());
@@ -163,16 +256,27 @@ void SchemaReader::parseDocument(xercesc::SAXParser& parser) {
 }
 
 void SchemaReader::logParseStopped(const XMLCh* message) {
-    ZrGlob::LogMessage(ZR_SEV_ERROR, 4, lgettext(u"Schema: Error: Reading file %s stopped: %s"),
-                       documentPath_.c_str(), message ? message : u"");
+    ZrWString text;
+    wsfmt(text, lgettext(u"Schema: Error: Reading file %s stopped: %s"), documentPath_.c_str(),
+          message ? message : u"");
+    reportError(ZR_SEV_ERROR, 4, text);
     failed = true;
+}
+
+void SchemaReader::reportError(int severity, int code, const ZrWString& text) {
+    if (!currentDocument.imported) {
+        ZrGlob::LogMessage(severity, code, u"%s", text.c_str());
+        return;
+    }
+    if (importFailure.empty())
+        importFailure = text;
 }
 
 namespace {
 
-// Logs one parser diagnostic: the parser's message, from just after its
-// "Message:" label when it has one, with the position and the document.
-void logParserDiagnostic(int severity, const XMLCh* format, const SAXParseException& e) {
+// One parser diagnostic: the parser's message, from just after its "Message:" label
+// when it has one, with the position and the document.
+ZrWString parserDiagnostic(const XMLCh* format, const SAXParseException& e) {
     const XMLCh* text = e.getMessage();
     ZrXString message(text ? text : u"", -1, ZR_CSET_DEFAULT);
     const long at = message.find(ZrXString("Message:", ZR_CSET_DEFAULT), 0);
@@ -180,24 +284,29 @@ void logParserDiagnostic(int severity, const XMLCh* format, const SAXParseExcept
         message = message.substr(at + 8);
     const XMLCh* systemId = e.getSystemId();
     ZrXString file(systemId ? systemId : u"", -1, ZR_CSET_DEFAULT);
-    ZrGlob::LogMessage(severity, 4, lgettext(format), static_cast<int>(e.getLineNumber()),
-                       static_cast<int>(e.getColumnNumber()), file.w_str(), message.w_str());
+    ZrWString out;
+    wsfmt(out, lgettext(format), static_cast<int>(e.getLineNumber()),
+          static_cast<int>(e.getColumnNumber()), file.w_str(), message.w_str());
+    return out;
 }
 
 } // namespace
 
 void SchemaReader::warning(const SAXParseException& e) {
-    logParserDiagnostic(ZR_SEV_WARNING, u"Schema: Warning: At line %d, column %d of file %s: %s",
-                        e);
+    ZrGlob::LogMessage(
+        ZR_SEV_WARNING, 4, u"%s",
+        parserDiagnostic(u"Schema: Warning: At line %d, column %d of file %s: %s", e).c_str());
 }
 
 void SchemaReader::error(const SAXParseException& e) {
-    logParserDiagnostic(ZR_SEV_ERROR, u"Schema: Error: At line %d, column %d of file %s: %s", e);
+    reportError(ZR_SEV_ERROR, 4,
+                parserDiagnostic(u"Schema: Error: At line %d, column %d of file %s: %s", e));
     failed = true;
 }
 
 void SchemaReader::fatalError(const SAXParseException& e) {
-    logParserDiagnostic(ZR_SEV_FATAL, u"Schema: Fatal: At line %d, column %d of file %s: %s", e);
+    reportError(ZR_SEV_FATAL, 4,
+                parserDiagnostic(u"Schema: Fatal: At line %d, column %d of file %s: %s", e));
     failed = true;
 }
 
@@ -207,9 +316,10 @@ void SchemaReader::fatalError(const SAXParseException& e) {
 // with an empty document, so nothing is opened.
 xercesc::InputSource* SchemaReader::resolveEntity(const XMLCh* publicId, const XMLCh* systemId) {
     const XMLCh* name = systemId && *systemId ? systemId : publicId;
-    ZrGlob::LogMessage(ZR_SEV_ERROR, 4,
-                       lgettext(u"Schema: Error: External entity '%s' in file %s is not read"),
-                       name ? name : u"", documentPath_.c_str());
+    ZrWString text;
+    wsfmt(text, lgettext(u"Schema: Error: External entity '%s' in file %s is not read"),
+          name ? name : u"", documentPath_.c_str());
+    reportError(ZR_SEV_ERROR, 4, text);
     failed = true;
     static const XMLByte kNothing[] = {0};
     return new xercesc::MemBufInputSource(kNothing, 0, systemId ? systemId : u"", false);

@@ -120,6 +120,7 @@ class SchemaReader : public xercesc::HandlerBase {
   private:
     // The namespace bound to `prefix`, or null when none is.
     const std::u16string* namespaceOfPrefix(std::u16string_view prefix);
+    static const std::u16string& xmlNamespace();
     // The pool's copy of a namespace's text.
     ZrName namespaceName(std::u16string_view uri);
 
@@ -139,6 +140,18 @@ class SchemaReader : public xercesc::HandlerBase {
     void doUnion(xercesc::AttributeList& attrs);
     void doFacet(xercesc::AttributeList& attrs, SimpleTypeDef& type, const XMLCh* facetName);
     void doInclude(xercesc::AttributeList& attrs);
+    void doImport(xercesc::AttributeList& attrs);
+    void doRedefine(xercesc::AttributeList& attrs);
+    void finishRedefine();
+    // The path of a document named by `written` in the document being read: a
+    // relative location is taken from that document's folder.
+    ZrWString locationFromDocument(const ZrWString& written) const;
+    // Inside a redefinition, a reference to the component being redefined means the
+    // original: its name becomes the one the original is read under.
+    void referToOriginal(ZrName& name, const ZrName& ns, bool isGroup) const;
+    // A top-level definition of the document being read, or of a redefinition, under
+    // the name it is kept by.
+    void nameDefinition(ZrName& name, const ZrName& ns, bool isGroup);
 
     // Start actions of the dispatch that need more than the attributes; they read
     // the tag's local part from tagLocal.
@@ -152,12 +165,29 @@ class SchemaReader : public xercesc::HandlerBase {
     // than the reader keeps state for; the rest of the subtree is skipped.
     bool tooDeep();
 
+    // A type (isGroup false) or group definition that a redefinition replaces.
+    struct RedefinedName {
+        TypeRef ref;
+        bool isGroup;
+    };
+
     // Parse driver steps.
-    // Appends a location to documentQueue unless the read has queued it already.
-    bool queueDocument(const ZrWString& location);
-    // Parses documentPath_; any failure, thrown or reported, sets `failed`.
+    struct QueuedDocument;
+    // Appends a document to its queue unless the read has queued it already.
+    bool queueDocument(QueuedDocument document);
+    // Parses the current document; any failure, thrown or reported, sets `failed`.
     void parseDocument(xercesc::SAXParser& parser);
+    // Reads the queued documents of one queue; false when a document of the main
+    // schema failed.
+    bool readQueue(xercesc::SAXParser& parser, std::deque<QueuedDocument>& queue);
+    void startDocument(const QueuedDocument& document);
+    // An imported document that failed: noted in the model, its partial state dropped.
+    void noteFailedImport(const ZrWString& reason);
+    void resetOpenComponents();
     void logParseStopped(const XMLCh* message);
+    // Logs an error of the document being read; an imported document's first error
+    // is kept as the reason it could not be read instead.
+    void reportError(int severity, int code, const ZrWString& text);
 
     SchemaModel& model;
 
@@ -207,7 +237,42 @@ class SchemaReader : public xercesc::HandlerBase {
     ZrName recentNamespaces[4];
     size_t nextRecentNamespace = 0;
 
-    std::deque<ZrWString> documentQueue;
+    // A document to read. The main schema is the main document and what it includes
+    // or redefines; imported documents and what they include are read after it,
+    // each with namespace declarations of its own.
+    struct QueuedDocument {
+        ZrWString path;
+        bool imported = false;
+        // The namespace an import expects, and the target namespace an included
+        // document without one of its own takes.
+        std::u16string ns;
+        std::u16string target;
+        // Names redefined in the document that redefines this one: its own
+        // definitions of those names are kept as the originals, under other names.
+        std::shared_ptr<const std::vector<RedefinedName>> redefined;
+        // Built-in text to read instead of a file.
+        std::string_view text;
+    };
+
+    std::deque<QueuedDocument> documentQueue;
+    std::deque<QueuedDocument> importQueue;
+    QueuedDocument currentDocument;
+    // The namespace declarations in force: the main schema's in the model, or the
+    // current imported document's own.
+    NamespaceBindings* bindings = nullptr;
+    NamespaceBindings importBindings;
+    // The first error of the imported document being read.
+    ZrWString importFailure;
+    // Whether any name of the main schema is in the XML namespace, and whether a
+    // document for it has been read.
+    bool usesXmlNamespace = false;
+    bool readXmlNamespace = false;
+    // The redefinition being read: its names so far, and the top-level definition
+    // open in it.
+    std::shared_ptr<std::vector<RedefinedName>> redefinitions;
+    int32_t redefineDepth = 0;
+    TypeRef redefining;
+    bool redefiningGroup = false;
     ZrURI documentURI;
     // Path of the document being parsed, as queued; named in messages.
     ZrWString documentPath_;

@@ -57,6 +57,7 @@ void SchemaReader::doRestriction(xercesc::AttributeList& attrs) {
         if (XmlName(attrs.getName(i)) != u"base" || !typeTarget)
             continue;
         parseName(attrs.getValue(i), true, typeTarget->baseName, typeTarget->baseNs);
+        referToOriginal(typeTarget->baseName, typeTarget->baseNs, false);
     }
 }
 
