@@ -142,6 +142,11 @@ bool SchemaReader::readQueue(xercesc::SAXParser& parser, std::deque<QueuedDocume
     while (!queue.empty()) {
         startDocument(queue.front());
         queue.pop_front();
+        if (currentDocument.imported && currentDocument.text.empty() &&
+            !FPInputStream(documentPath_.c_str(), false).isOpen()) {
+            noteFailedImport(ZrWString(u"the file cannot be opened"));
+            continue;
+        }
         parseDocument(parser);
         if (!currentDocument.imported) {
             if (failed)
