@@ -114,7 +114,9 @@ bool TypeResolver::lookupType(std::u16string_view localName, std::u16string_view
         ZrGlob::LogMessage(ZR_SEV_NOTICE, 0, "Oops, lookupType asked to lookup a complex type");
         return false;
     }
-    const std::u16string_view name = localName == u"anyType" ? u"string" : localName;
+    // The two ur-types hold any text.
+    const std::u16string_view name =
+        localName == u"anyType" || localName == u"anySimpleType" ? u"string" : localName;
 
     const SimpleTypeDef* simpleType = model_.simpleTypes.find(name, namespaceURI);
     if (!simpleType) {

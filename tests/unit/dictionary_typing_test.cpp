@@ -282,6 +282,7 @@ const ResolveCase kResolves[] = {
     {"PrecisionAndScale", "t decimal scale=3 precision=8", "decimal", 0, 8, 3},
     {"ScaleClampedToShort", "t decimal scale=99999", "decimal", 0, 16, 32767},
     {"AnyTypeBaseIsString", "t anyType maxLength=12", "string", 12, 0, 0},
+    {"AnySimpleTypeBaseIsString", "t anySimpleType maxLength=5", "string", 5, 0, 0},
     {"UnusablePatternLeavesPrecision", "t int pattern=a+", "int", 0, 10, 0},
 };
 
