@@ -92,10 +92,13 @@ void SchemaReader::startElement(const XMLCh* name, xercesc::AttributeList& attrs
         ++skipDepth;
         return;
     }
+    ++elementDepth;
     const bool first = firstElement;
     if (firstElement) {
         FirstElementAttrs(attrs);
         firstElement = false;
+    } else {
+        declareInScope(attrs);
     }
     // The tag's name resolved as parseName would, but its namespace is only compared,
     // not kept: copying it for every tag costs more than the comparison.
@@ -148,12 +151,58 @@ void SchemaReader::endElement(const XMLCh* name) {
     // The end tags of a skipped subtree, the skipping element's and a list's own
     // included, only unwind the count.
     if (skipDepth != 0) {
-        --skipDepth;
+        if (--skipDepth == 0)
+            endScope();
         return;
     }
     // Only the local part chooses the action; the end tag's namespace plays no part.
     if (const EndAction* entry = kEndIndex.find(XmlQualifiedName(name).local))
         (this->*entry->act)();
+    endScope();
+}
+
+// Namespaces declared below the first element hold for that element and what it
+// contains.
+void SchemaReader::declareInScope(xercesc::AttributeList& attrs) {
+    for (XMLSize_t i = 0; i < attrs.getLength(); ++i) {
+        if (!XmlName(attrs.getName(i)).startsWith(u"xmlns"))
+            continue;
+        const std::u16string_view name = xmlText(attrs.getName(i));
+        ScopedDeclaration saved;
+        saved.depth = elementDepth;
+        saved.isDefault = !(name.size() > 5 && name[5] == u':');
+        if (!saved.isDefault)
+            saved.prefix = name.substr(6);
+        std::u16string value(xmlText(attrs.getValue(i)));
+        if (saved.isDefault) {
+            saved.bound = true;
+            saved.previous = std::exchange(bindings->defaultNamespace, std::move(value));
+        } else {
+            const auto it = bindings->prefixes.find(saved.prefix);
+            saved.bound = it != bindings->prefixes.end();
+            if (saved.bound)
+                saved.previous = std::exchange(it->second, std::move(value));
+            else
+                bindings->prefixes.emplace(saved.prefix, std::move(value));
+        }
+        scopedDeclarations.push_back(std::move(saved));
+        recentPrefixesStale = true;
+    }
+}
+
+void SchemaReader::endScope() {
+    while (!scopedDeclarations.empty() && scopedDeclarations.back().depth == elementDepth) {
+        ScopedDeclaration& saved = scopedDeclarations.back();
+        if (saved.isDefault)
+            bindings->defaultNamespace = std::move(saved.previous);
+        else if (saved.bound)
+            bindings->prefixes[saved.prefix] = std::move(saved.previous);
+        else
+            bindings->prefixes.erase(saved.prefix);
+        scopedDeclarations.pop_back();
+        recentPrefixesStale = true;
+    }
+    --elementDepth;
 }
 
 void SchemaReader::skipSubtree(xercesc::AttributeList&) { skipDepth = 1; }

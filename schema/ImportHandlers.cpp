@@ -33,12 +33,12 @@ void SchemaReader::doImport(xercesc::AttributeList& attrs) {
     }
     if (!located) {
         if (imported.ns != kXmlNamespace)
-            model.failedImports.push_back({imported.ns, u"", u"the import gives no location"});
+            noteImportFailure(imported.ns, u"", u"the import gives no location");
         return;
     }
     if (ZrURI(valueBuffer.c_str()).protocol() != ZRP_NONE) {
-        model.failedImports.push_back({imported.ns, std::u16string(valueBuffer.view()),
-                                       u"a location with a protocol is never fetched"});
+        noteImportFailure(imported.ns, valueBuffer.view(),
+                          u"a location with a protocol is never fetched");
         return;
     }
     imported.path = locationFromDocument(valueBuffer);

@@ -174,6 +174,8 @@ void SchemaReader::startDocument(const QueuedDocument& document) {
     firstElement = true;
     failed = false;
     skipDepth = 0;
+    elementDepth = 0;
+    scopedDeclarations.clear();
     importFailure.clear();
     recentPrefixesStale = true;
     if (!document.imported) {
@@ -188,9 +190,18 @@ void SchemaReader::startDocument(const QueuedDocument& document) {
 }
 
 void SchemaReader::noteFailedImport(const ZrWString& reason) {
-    model.failedImports.push_back(
-        {currentDocument.ns, std::u16string(documentPath_.view()), std::u16string(reason.view())});
+    noteImportFailure(currentDocument.ns, documentPath_.view(), reason.view());
     resetOpenComponents();
+}
+
+void SchemaReader::noteImportFailure(std::u16string_view ns, std::u16string_view location,
+                                     std::u16string_view reason) {
+    for (const SchemaModel::ImportFailure& noted : model.failedImports) {
+        if (noted.ns == ns && noted.location == location)
+            return;
+    }
+    model.failedImports.push_back(
+        {std::u16string(ns), std::u16string(location), std::u16string(reason)});
 }
 
 void SchemaReader::resetOpenComponents() {

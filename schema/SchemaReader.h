@@ -161,6 +161,9 @@ class SchemaReader : public xercesc::HandlerBase {
     void doSimpleContent(xercesc::AttributeList& attrs);
     void doComplexContent(xercesc::AttributeList& attrs);
     void skipSubtree(xercesc::AttributeList& attrs);
+    void declareInScope(xercesc::AttributeList& attrs);
+    // Ends the element at elementDepth, and the namespaces it declared.
+    void endScope();
     // Logs and fails a document that nests declarations, types and groups deeper
     // than the reader keeps state for; the rest of the subtree is skipped.
     bool tooDeep();
@@ -183,6 +186,9 @@ class SchemaReader : public xercesc::HandlerBase {
     void startDocument(const QueuedDocument& document);
     // An imported document that failed: noted in the model, its partial state dropped.
     void noteFailedImport(const ZrWString& reason);
+    // Notes once why a document imported for `ns` from `location` was not read.
+    void noteImportFailure(std::u16string_view ns, std::u16string_view location,
+                           std::u16string_view reason);
     void resetOpenComponents();
     void logParseStopped(const XMLCh* message);
     // Logs an error of the document being read; an imported document's first error
@@ -195,6 +201,19 @@ class SchemaReader : public xercesc::HandlerBase {
     bool failed = false;
     bool firstElement = true;
     int32_t skipDepth = 0;
+    // Elements open and read (not skipped), and the namespace declarations they made,
+    // with what each replaced.
+    int32_t elementDepth = 0;
+
+    struct ScopedDeclaration {
+        int32_t depth = 0;
+        bool isDefault = false;
+        bool bound = false;
+        std::u16string prefix;
+        std::u16string previous;
+    };
+
+    std::vector<ScopedDeclaration> scopedDeclarations;
 
     // Components under construction.
     ElementDef currentElement;

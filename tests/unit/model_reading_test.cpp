@@ -51,10 +51,10 @@ const ModelCase kModelCases[] = {
      "global element name=d type={xs}string\n"
      "global element name=e type={xs}string\n",
      ""},
-    {"DeclarationNamespacesAreNotHonoured", "",
+    {"DeclarationNamespacesHoldForTheirElement", "",
      R"(<xs:element name="a" type="foo:bar" xmlns:foo="urn:foo" minOccurs="0" maxOccurs="2"
             default="x" fixed="y" form="qualified" use="required"/>)",
-     "global element name=a type=bar\n", "512 0 xmlns in element attrs\n"},
+     "global element name=a type={urn:foo}bar\n", "512 0 xmlns in element attrs\n"},
     {"BareNamesResolveByRole", kTns,
      R"(<xs:element name="a" type="string"/>
         <xs:element ref="a"/>
@@ -167,15 +167,17 @@ const ModelCase kModelCases[] = {
      "complexType anon0 group\n"
      "  element name=b type={xs}string\n",
      "512 0 Group g has both name and ref\n"},
-    {"NamespaceDeclarationsOnTypesAreReported", "",
+    {"NamespaceDeclarationsOnTypesAreReportedAndEndWithThem", "",
      R"(<xs:group name="g" xmlns:z="urn:z"/>
         <xs:complexType name="c" xmlns="urn:d"><xs:complexContent>
           <xs:extension base="b" xmlns:y="urn:y"/></xs:complexContent></xs:complexType>
         <xs:simpleType name="s" xmlns:w="urn:w"><xs:restriction base="xs:int" xmlns:v="v"/>
-        </xs:simpleType>)",
+        </xs:simpleType>
+        <xs:simpleType name="t"><xs:restriction base="b"/></xs:simpleType>)",
      "complexType g group\n"
-     "complexType c base=b\n"
-     "simpleType s base={xs}int\n",
+     "complexType c base={urn:d}b\n"
+     "simpleType s base={xs}int\n"
+     "simpleType t base=b\n",
      "512 0 xmlns in group attrs\n"
      "512 0 xmlns in complextype attrs\n"
      "512 0 xmlns in extension attrs\n"

@@ -94,15 +94,16 @@ TEST(Namespaces, FirstElementAttributesDeclareTheNamespaces) {
                           "global element name={urn:t}f type={urn:d}T\n");
 }
 
-// Only the first element of a document declares namespaces, whatever its name.
-TEST(Namespaces, OnlyTheFirstElementDeclares) {
+// Only the first element of a document declares the target namespace, whatever its
+// name; prefixes declared below it hold within their element.
+TEST(Namespaces, OnlyTheFirstElementDeclaresTheTarget) {
     const std::string document = std::string("<wrapper xmlns:xs=\"") + kXsdNs +
                                  R"(" targetNamespace="urn:w" bogus="1">
           <xs:schema targetNamespace="urn:ignored" xmlns:q="urn:q">
             <xs:element name="a" type="q:T"/></xs:schema></wrapper>)";
     const ReadOutcome read = readSchemaText(document);
     EXPECT_TRUE(read.ok);
-    EXPECT_EQ(read.model, "global element name={urn:w}a type=T\n");
+    EXPECT_EQ(read.model, "global element name={urn:w}a type={urn:q}T\n");
     EXPECT_EQ(read.log, "512 0 Unknown first element attribute 'bogus'\n");
 }
 
