@@ -1,0 +1,569 @@
+#include "RecordOutput.h"
+
+#include "JsonWriter.h"
+
+#include <cerrno>
+#include <charconv>
+#include <cstdlib>
+#include <cstring>
+#include <string>
+#include <string_view>
+#include <unordered_map>
+
+namespace {
+
+// --- JSON ---------------------------------------------------------------------------
+
+// The items of a definition string shown beside the fields every type has, each the
+// first of its name as ZrDType::Item finds it.
+struct DefinitionItems {
+    const std::string* maxLength = nullptr;
+    const std::string* picture = nullptr;
+    const std::string* isSigned = nullptr;
+};
+
+DefinitionItems definitionItems(const ZrDType& type) {
+    DefinitionItems found;
+    const ZrDType::Definition* def = type.Parsed();
+    if (!def)
+        return found;
+    for (const auto& [key, value] : def->items) {
+        if (!found.maxLength && key == "maxlength")
+            found.maxLength = &value;
+        else if (!found.picture && key == "picture")
+            found.picture = &value;
+        else if (!found.isSigned && key == "signed")
+            found.isSigned = &value;
+    }
+    return found;
+}
+
+// maxlength is a number when it reads as one, as strtol reads it; signed is a truth
+// value; picture stays text.
+void writeDefinitionItems(JsonWriter& json, const ZrDType& type) {
+    const DefinitionItems items = definitionItems(type);
+    if (items.maxLength) {
+        const char* text = items.maxLength->c_str();
+        char* end = nullptr;
+        errno = 0;
+        const long value = std::strtol(text, &end, 10);
+        json.key("maxlength");
+        if (end != text && *end == '\0' && errno == 0)
+            json.value(value);
+        else
+            json.value(*items.maxLength);
+    }
+    if (items.picture) {
+        json.key("picture");
+        json.value(*items.picture);
+    }
+    if (items.isSigned) {
+        json.key("signed");
+        json.value(*items.isSigned == "true");
+    }
+}
+
+void writeType(JsonWriter& json, const ZrDType& type) {
+    json.beginObject();
+    json.key("class");
+    json.value(type.TypeClass());
+    json.key("alias");
+    json.value(type.Alias());
+    json.key("usage");
+    json.value(type.Usage());
+    json.key("length");
+    json.value(type.Length());
+    json.key("precision");
+    json.value(type.Precision());
+    json.key("decimals");
+    json.value(type.DecimalPlaces());
+    json.key("nulls");
+    json.value(type.Nulls());
+    writeDefinitionItems(json, type);
+    json.endObject();
+}
+
+void writeRecord(JsonWriter& json, const ZrRecord& record) {
+    json.beginObject();
+    json.key("name");
+    json.value(record.name.view());
+    json.key("length");
+    json.value(record.RecordLength());
+    json.key("fields");
+    json.beginArray();
+    for (int i = 0; i < record.FieldCount(); ++i) {
+        const ZrField* field = record.GetFieldbyPos(i);
+        if (!field)
+            continue;
+        json.beginObject();
+        json.key("name");
+        json.value(field->FieldName().view());
+        json.key("alias");
+        json.value(field->Alias().view());
+        json.key("description");
+        json.value(field->Description());
+        json.key("type");
+        writeType(json, field->DataType());
+        json.endObject();
+    }
+    json.endArray();
+    json.endObject();
+}
+
+// --- text ---------------------------------------------------------------------------
+
+// Display width of UTF-8 text, counted in code points: close enough for the names
+// and aliases of a schema.
+size_t displayWidth(std::string_view text) {
+    size_t width = 0;
+    for (char c : text)
+        width += (static_cast<unsigned char>(c) & 0xC0) != 0x80;
+    return width;
+}
+
+size_t digitCount(long long value) {
+    char digits[24];
+    return static_cast<size_t>(std::to_chars(digits, digits + sizeof digits, value).ptr - digits);
+}
+
+void appendNumber(std::string& line, long long value) {
+    char digits[24];
+    const auto result = std::to_chars(digits, digits + sizeof digits, value);
+    line.append(digits, result.ptr);
+}
+
+// The columns of a record's table, in order; numbers are right-aligned and the
+// last column is not padded, so lines carry no trailing blanks.
+enum Column { kField, kType, kUsage, kLength, kPrecision, kDecimals, kNulls, kColumns };
+
+constexpr std::string_view kTitles[kColumns] = {"field",     "type",     "usage", "length",
+                                                "precision", "decimals", "nulls"};
+
+class RecordTable {
+  public:
+    void print(OutputBuffer& out, const ZrRecord& record) {
+        fields_.clear();
+        for (int i = 0; i < record.FieldCount(); ++i)
+            if (const ZrField* field = record.GetFieldbyPos(i))
+                fields_.push_back(field);
+        if (names_.size() < fields_.size())
+            names_.resize(fields_.size());
+        for (size_t c = 0; c < kColumns; ++c)
+            widths_[c] = kTitles[c].size();
+        for (size_t f = 0; f < fields_.size(); ++f) {
+            names_[f].clear();
+            appendUtf8(names_[f], fields_[f]->FieldName().view());
+            const ZrDType& type = fields_[f]->DataType();
+            widen(kField, displayWidth(names_[f]));
+            widen(kType, displayWidth(type.Alias()));
+            widen(kUsage, digitCount(type.Usage()));
+            widen(kLength, digitCount(type.Length()));
+            widen(kPrecision, digitCount(type.Precision()));
+            widen(kDecimals, digitCount(type.DecimalPlaces()));
+            widen(kNulls, type.Nulls() ? 3 : 2);
+        }
+
+        line_.clear();
+        appendUtf8(line_, record.name.view());
+        line_ += " (length ";
+        appendNumber(line_, record.RecordLength());
+        line_ += ", ";
+        appendNumber(line_, record.FieldCount());
+        line_ += record.FieldCount() == 1 ? " field)\n" : " fields)\n";
+        line_ += "  ";
+        for (size_t c = 0; c < kColumns; ++c) {
+            const bool right = c >= kUsage && c <= kDecimals;
+            cell(c, kTitles[c], kTitles[c].size(), right);
+        }
+        line_ += '\n';
+        out.write(line_);
+
+        for (size_t f = 0; f < fields_.size(); ++f) {
+            const ZrDType& type = fields_[f]->DataType();
+            line_.assign("  ");
+            cell(kField, names_[f], displayWidth(names_[f]), false);
+            const std::string_view alias = type.Alias();
+            cell(kType, alias, displayWidth(alias), false);
+            number(kUsage, type.Usage());
+            number(kLength, type.Length());
+            number(kPrecision, type.Precision());
+            number(kDecimals, type.DecimalPlaces());
+            cell(kNulls, type.Nulls() ? "yes" : "no", 0, false);
+            line_ += '\n';
+            out.write(line_);
+        }
+    }
+
+  private:
+    void widen(size_t column, size_t width) {
+        if (width > widths_[column])
+            widths_[column] = width;
+    }
+
+    void cell(size_t column, std::string_view text, size_t width, bool right) {
+        if (column > 0)
+            line_ += "  ";
+        const size_t padding = column + 1 < kColumns ? widths_[column] - width : 0;
+        if (right)
+            line_.append(padding, ' ');
+        line_ += text;
+        if (!right)
+            line_.append(padding, ' ');
+    }
+
+    void number(size_t column, long long value) {
+        line_ += "  ";
+        line_.append(widths_[column] - digitCount(value), ' ');
+        appendNumber(line_, value);
+    }
+
+    std::vector<const ZrField*> fields_;
+    std::vector<std::string> names_;
+    size_t widths_[kColumns] = {};
+    std::string line_;
+};
+
+// --- links between records ----------------------------------------------------------
+
+bool isRecordField(const ZrField& field) {
+    return std::strcmp(field.DataType().TypeClass(), "Structure") == 0;
+}
+
+// The dictionary's records by name, the first of each name, as the host's list
+// finds them; numbered by position.
+class RecordIndex {
+  public:
+    static constexpr size_t npos = static_cast<size_t>(-1);
+
+    explicit RecordIndex(const ZrRecordList& dictionary) {
+        records_.reserve(static_cast<size_t>(dictionary.Count()));
+        byName_.reserve(static_cast<size_t>(dictionary.Count()));
+        for (int i = 0; i < dictionary.Count(); ++i) {
+            const ZrRecord* record = dictionary[i];
+            if (!record)
+                continue;
+            byName_.emplace(record->name.view(), records_.size());
+            records_.push_back(record);
+        }
+    }
+
+    size_t find(std::u16string_view name) const {
+        const auto it = byName_.find(name);
+        return it == byName_.end() ? npos : it->second;
+    }
+
+    const ZrRecord* operator[](size_t at) const { return records_[at]; }
+
+    size_t size() const { return records_.size(); }
+
+  private:
+    std::vector<const ZrRecord*> records_;
+    std::unordered_map<std::u16string_view, size_t> byName_;
+};
+
+// --- tree ---------------------------------------------------------------------------
+
+// Deeper than this, lines stop moving right and carry their level instead, so a
+// chain of nested records as long as the schema makes it gives lines of bounded
+// length.
+constexpr size_t kDrawnLevels = 48;
+
+class TreePrinter {
+  public:
+    TreePrinter(OutputBuffer& out, const RecordIndex& index)
+        : out_(out), index_(index), shown_(index.size()), onPath_(index.size()) {}
+
+    // A record not in the dictionary (a flattening's target) stands for the one of
+    // its name there.
+    void root(const ZrRecord& record) {
+        const size_t at = index_.find(record.name.view());
+        if (at != RecordIndex::npos) {
+            if (shown_[at])
+                return;
+            shown_[at] = true;
+        }
+        line_.clear();
+        appendUtf8(line_, record.name.view());
+        line_ += " (length ";
+        appendNumber(line_, record.RecordLength());
+        line_ += ")\n";
+        out_.write(line_);
+        prefix_.clear();
+        open(record, at);
+        walk();
+    }
+
+  private:
+    // An opened record: the next field to show, and the prefix of its fields' lines.
+    struct Frame {
+        const ZrRecord* record;
+        size_t at; // in the index, or npos
+        int next;
+        size_t prefixLength;
+    };
+
+    void open(const ZrRecord& record, size_t at) {
+        if (at != RecordIndex::npos)
+            onPath_[at] = true;
+        stack_.push_back(Frame{&record, at, 0, prefix_.size()});
+    }
+
+    // Depth first with a stack of its own, so nesting as deep as the schema makes it
+    // costs memory, not the call stack.
+    void walk() {
+        while (!stack_.empty()) {
+            Frame& frame = stack_.back();
+            if (frame.next >= frame.record->FieldCount()) {
+                if (frame.at != RecordIndex::npos)
+                    onPath_[frame.at] = false;
+                stack_.pop_back();
+                if (!stack_.empty())
+                    prefix_.resize(stack_.back().prefixLength);
+                continue;
+            }
+            const ZrField* field = frame.record->GetFieldbyPos(frame.next++);
+            if (!field)
+                continue;
+            const bool last = frame.next >= frame.record->FieldCount();
+            const ZrDType& type = field->DataType();
+            line_.assign(prefix_);
+            line_ += last ? "\u2514\u2500\u2500 " : "\u251c\u2500\u2500 ";
+            if (stack_.size() > kDrawnLevels) {
+                line_ += '[';
+                appendNumber(line_, static_cast<long long>(stack_.size()));
+                line_ += "] ";
+            }
+            appendUtf8(line_, field->FieldName().view());
+            line_ += ": ";
+            line_ += type.Alias();
+            line_ += ", length ";
+            appendNumber(line_, type.Length());
+            const ZrRecord* nested = nullptr;
+            size_t nestedAt = RecordIndex::npos;
+            if (isRecordField(*field)) {
+                nestedAt = index_.find(field->FieldName().view());
+                if (nestedAt == RecordIndex::npos)
+                    line_ += " (no such record)";
+                else if (onPath_[nestedAt])
+                    line_ += " (recursive)";
+                else if (shown_[nestedAt])
+                    line_ += " (shown above)";
+                else
+                    nested = index_[nestedAt];
+            }
+            line_ += '\n';
+            out_.write(line_);
+            if (nested) {
+                shown_[nestedAt] = true;
+                if (stack_.size() < kDrawnLevels)
+                    prefix_ += last ? "    " : "\u2502   ";
+                open(*nested, nestedAt);
+            }
+        }
+    }
+
+    OutputBuffer& out_;
+    const RecordIndex& index_;
+    std::vector<bool> shown_;
+    std::vector<bool> onPath_;
+    std::vector<Frame> stack_;
+    std::string prefix_;
+    std::string line_;
+};
+
+// --- graph --------------------------------------------------------------------------
+
+// Text for an HTML-like label: well-formed UTF-8, markup characters as entities,
+// control characters (which the label's XML cannot hold) as U+FFFD.
+void appendLabelText(std::string& out, std::string_view text) {
+    std::string valid;
+    appendValidUtf8(valid, text);
+    for (char c : valid) {
+        switch (c) {
+        case '&':
+            out += "&amp;";
+            break;
+        case '<':
+            out += "&lt;";
+            break;
+        case '>':
+            out += "&gt;";
+            break;
+        case '"':
+            out += "&quot;";
+            break;
+        default:
+            if (static_cast<unsigned char>(c) < 0x20)
+                out += "\xEF\xBF\xBD";
+            else
+                out += c;
+        }
+    }
+}
+
+// Text inside a quoted DOT string.
+void appendQuotedText(std::string& out, std::string_view text) {
+    std::string valid;
+    appendValidUtf8(valid, text);
+    for (char c : valid) {
+        if (c == '"' || c == '\\')
+            out += '\\';
+        out += static_cast<unsigned char>(c) < 0x20 ? ' ' : c;
+    }
+}
+
+class GraphPrinter {
+  public:
+    GraphPrinter(OutputBuffer& out, const RecordIndex& index) : out_(out), index_(index) {}
+
+    void print(const std::vector<const ZrRecord*>& roots) {
+        out_.write("digraph records {\n"
+                   "  rankdir=LR;\n"
+                   "  node [shape=plaintext, fontname=\"Helvetica\", fontsize=10];\n"
+                   "  edge [fontname=\"Helvetica\", fontsize=9];\n");
+        for (const ZrRecord* root : roots)
+            node(root);
+        // Records reached only through fields are added as they are found.
+        for (size_t i = 0; i < order_.size(); ++i)
+            printNode(i);
+        out_.write("}\n");
+    }
+
+  private:
+    size_t node(const ZrRecord* record) {
+        const auto [it, added] = ids_.emplace(record, order_.size());
+        if (added)
+            order_.push_back(record);
+        return it->second;
+    }
+
+    void printNode(size_t id) {
+        const ZrRecord& record = *order_[id];
+        std::string name;
+        appendUtf8(name, record.name.view());
+        line_ = "  r";
+        appendNumber(line_, static_cast<long long>(id));
+        line_ += " [label=<<table border=\"0\" cellborder=\"1\" cellspacing=\"0\" "
+                 "cellpadding=\"3\"><tr><td colspan=\"2\" bgcolor=\"lightgrey\"><b>";
+        appendLabelText(line_, name);
+        line_ += "</b></td></tr>";
+        for (int i = 0; i < record.FieldCount(); ++i) {
+            const ZrField* field = record.GetFieldbyPos(i);
+            if (!field || isRecordField(*field))
+                continue;
+            const ZrDType& type = field->DataType();
+            line_ += "<tr><td align=\"left\">";
+            name.clear();
+            appendUtf8(name, field->FieldName().view());
+            appendLabelText(line_, name);
+            line_ += "</td><td align=\"left\">";
+            appendLabelText(line_, type.Alias());
+            if (type.Length() != 0) {
+                line_ += '(';
+                appendNumber(line_, type.Length());
+                line_ += ')';
+            }
+            line_ += "</td></tr>";
+        }
+        line_ += "</table>>];\n";
+        out_.write(line_);
+
+        for (int i = 0; i < record.FieldCount(); ++i) {
+            const ZrField* field = record.GetFieldbyPos(i);
+            if (!field || !isRecordField(*field))
+                continue;
+            name.clear();
+            appendUtf8(name, field->FieldName().view());
+            line_ = "  r";
+            appendNumber(line_, static_cast<long long>(id));
+            line_ += " -> ";
+            const size_t at = index_.find(field->FieldName().view());
+            if (at == RecordIndex::npos) {
+                // A record the dictionary lacks still gets a node, drawn as missing.
+                line_ += "\"missing ";
+                appendQuotedText(line_, name);
+                line_ += "\" [style=dashed, label=\"";
+            } else {
+                line_ += 'r';
+                appendNumber(line_, static_cast<long long>(node(index_[at])));
+                line_ += " [label=\"";
+            }
+            appendQuotedText(line_, name);
+            line_ += "\"];\n";
+            out_.write(line_);
+        }
+    }
+
+    OutputBuffer& out_;
+    const RecordIndex& index_;
+    std::unordered_map<const ZrRecord*, size_t> ids_;
+    std::vector<const ZrRecord*> order_;
+    std::string line_;
+};
+
+} // namespace
+
+void printRecordDocument(std::ostream& out, int status, const std::vector<const ZrRecord*>& records,
+                         const std::vector<LoggedMessage>& messages) {
+    OutputBuffer buffer(out);
+    JsonWriter json(buffer);
+    json.beginObject();
+    json.key("status");
+    json.value(status);
+    json.key("records");
+    json.beginArray();
+    for (const ZrRecord* record : records)
+        writeRecord(json, *record);
+    json.endArray();
+    json.key("messages");
+    json.beginArray();
+    for (const LoggedMessage& message : messages) {
+        json.beginObject();
+        json.key("severity");
+        json.value(message.severity);
+        json.key("code");
+        json.value(message.code);
+        json.key("text");
+        json.value(message.text);
+        json.endObject();
+    }
+    json.endArray();
+    json.endObject();
+    json.endDocument();
+}
+
+void printRecordsText(std::ostream& out, const std::vector<const ZrRecord*>& records) {
+    OutputBuffer buffer(out);
+    if (records.empty()) {
+        buffer.write("(no records)\n");
+        return;
+    }
+    RecordTable table;
+    bool first = true;
+    for (const ZrRecord* record : records) {
+        if (!first)
+            buffer.put('\n');
+        first = false;
+        table.print(buffer, *record);
+    }
+}
+
+void printRecordTree(std::ostream& out, const std::vector<const ZrRecord*>& roots,
+                     const ZrRecordList& dictionary) {
+    OutputBuffer buffer(out);
+    if (roots.empty()) {
+        buffer.write("(no records)\n");
+        return;
+    }
+    const RecordIndex index(dictionary);
+    TreePrinter tree(buffer, index);
+    for (const ZrRecord* root : roots)
+        tree.root(*root);
+}
+
+void printRecordGraph(std::ostream& out, const std::vector<const ZrRecord*>& roots,
+                      const ZrRecordList& dictionary) {
+    OutputBuffer buffer(out);
+    const RecordIndex index(dictionary);
+    GraphPrinter(buffer, index).print(roots);
+}
