@@ -1,6 +1,6 @@
 #include "RecordOutput.h"
 
-#include "JsonWriter.h"
+#include "TextOutput.h"
 
 #include <cerrno>
 #include <charconv>
@@ -13,6 +13,29 @@
 namespace {
 
 // --- JSON ---------------------------------------------------------------------------
+//
+// The document has a fixed shape, so it is written from literal pieces that carry the
+// layout of nlohmann-json's dump(2) (newline, two spaces a level, "key": value), which
+// zrdict's output had when it was built as a tree: one append per piece, no writer
+// state, the same bytes.
+
+void appendQuoted(std::string& out, std::string_view text) {
+    out += '"';
+    appendJsonEscaped(out, text);
+    out += '"';
+}
+
+void appendQuoted(std::string& out, std::u16string_view text) {
+    out += '"';
+    appendJsonEscaped(out, text);
+    out += '"';
+}
+
+void appendNumber(std::string& line, long long value) {
+    char digits[24];
+    const auto result = std::to_chars(digits, digits + sizeof digits, value);
+    line.append(digits, result.ptr);
+}
 
 // The items of a definition string shown beside the fields every type has, each the
 // first of its name as ZrDType::Item finds it.
@@ -40,74 +63,76 @@ DefinitionItems definitionItems(const ZrDType& type) {
 
 // maxlength is a number when it reads as one, as strtol reads it; signed is a truth
 // value; picture stays text.
-void writeDefinitionItems(JsonWriter& json, const ZrDType& type) {
+void appendDefinitionItems(std::string& out, const ZrDType& type) {
     const DefinitionItems items = definitionItems(type);
     if (items.maxLength) {
         const char* text = items.maxLength->c_str();
         char* end = nullptr;
         errno = 0;
         const long value = std::strtol(text, &end, 10);
-        json.key("maxlength");
+        out += ",\n            \"maxlength\": ";
         if (end != text && *end == '\0' && errno == 0)
-            json.value(value);
+            appendNumber(out, value);
         else
-            json.value(*items.maxLength);
+            appendQuoted(out, *items.maxLength);
     }
     if (items.picture) {
-        json.key("picture");
-        json.value(*items.picture);
+        out += ",\n            \"picture\": ";
+        appendQuoted(out, *items.picture);
     }
-    if (items.isSigned) {
-        json.key("signed");
-        json.value(*items.isSigned == "true");
-    }
+    if (items.isSigned)
+        out += *items.isSigned == "true" ? ",\n            \"signed\": true"
+                                         : ",\n            \"signed\": false";
 }
 
-void writeType(JsonWriter& json, const ZrDType& type) {
-    json.beginObject();
-    json.key("class");
-    json.value(type.TypeClass());
-    json.key("alias");
-    json.value(type.Alias());
-    json.key("usage");
-    json.value(type.Usage());
-    json.key("length");
-    json.value(type.Length());
-    json.key("precision");
-    json.value(type.Precision());
-    json.key("decimals");
-    json.value(type.DecimalPlaces());
-    json.key("nulls");
-    json.value(type.Nulls());
-    writeDefinitionItems(json, type);
-    json.endObject();
+void appendField(std::string& out, const ZrField& field) {
+    const ZrDType& type = field.DataType();
+    out += "        {\n          \"name\": ";
+    appendQuoted(out, field.FieldName().view());
+    out += ",\n          \"alias\": ";
+    appendQuoted(out, field.Alias().view());
+    out += ",\n          \"description\": ";
+    appendQuoted(out, std::string_view(field.Description()));
+    out += ",\n          \"type\": {\n            \"class\": ";
+    appendQuoted(out, std::string_view(type.TypeClass()));
+    out += ",\n            \"alias\": ";
+    appendQuoted(out, std::string_view(type.Alias()));
+    out += ",\n            \"usage\": ";
+    appendNumber(out, type.Usage());
+    out += ",\n            \"length\": ";
+    appendNumber(out, type.Length());
+    out += ",\n            \"precision\": ";
+    appendNumber(out, type.Precision());
+    out += ",\n            \"decimals\": ";
+    appendNumber(out, type.DecimalPlaces());
+    out += type.Nulls() ? ",\n            \"nulls\": true" : ",\n            \"nulls\": false";
+    appendDefinitionItems(out, type);
+    out += "\n          }\n        }";
 }
 
-void writeRecord(JsonWriter& json, const ZrRecord& record) {
-    json.beginObject();
-    json.key("name");
-    json.value(record.name.view());
-    json.key("length");
-    json.value(record.RecordLength());
-    json.key("fields");
-    json.beginArray();
+// One element of the records array, without the separator before it.
+void writeRecord(OutputBuffer& out, std::string& text, const ZrRecord& record) {
+    text.assign("    {\n      \"name\": ");
+    appendQuoted(text, record.name.view());
+    text += ",\n      \"length\": ";
+    appendNumber(text, record.RecordLength());
+    text += ",\n      \"fields\": [";
+    bool anyField = false;
     for (int i = 0; i < record.FieldCount(); ++i) {
         const ZrField* field = record.GetFieldbyPos(i);
         if (!field)
             continue;
-        json.beginObject();
-        json.key("name");
-        json.value(field->FieldName().view());
-        json.key("alias");
-        json.value(field->Alias().view());
-        json.key("description");
-        json.value(field->Description());
-        json.key("type");
-        writeType(json, field->DataType());
-        json.endObject();
+        text += anyField ? ",\n" : "\n";
+        anyField = true;
+        appendField(text, *field);
+        // A record of many fields goes out in pieces, not held whole.
+        if (text.size() >= (1 << 16)) {
+            out.write(text);
+            text.clear();
+        }
     }
-    json.endArray();
-    json.endObject();
+    text += anyField ? "\n      ]\n    }" : "]\n    }";
+    out.write(text);
 }
 
 // --- text ---------------------------------------------------------------------------
@@ -124,12 +149,6 @@ size_t displayWidth(std::string_view text) {
 size_t digitCount(long long value) {
     char digits[24];
     return static_cast<size_t>(std::to_chars(digits, digits + sizeof digits, value).ptr - digits);
-}
-
-void appendNumber(std::string& line, long long value) {
-    char digits[24];
-    const auto result = std::to_chars(digits, digits + sizeof digits, value);
-    line.append(digits, result.ptr);
 }
 
 // The columns of a record's table, in order; numbers are right-aligned and the
@@ -506,30 +525,28 @@ class GraphPrinter {
 void printRecordDocument(std::ostream& out, int status, const std::vector<const ZrRecord*>& records,
                          const std::vector<LoggedMessage>& messages) {
     OutputBuffer buffer(out);
-    JsonWriter json(buffer);
-    json.beginObject();
-    json.key("status");
-    json.value(status);
-    json.key("records");
-    json.beginArray();
-    for (const ZrRecord* record : records)
-        writeRecord(json, *record);
-    json.endArray();
-    json.key("messages");
-    json.beginArray();
-    for (const LoggedMessage& message : messages) {
-        json.beginObject();
-        json.key("severity");
-        json.value(message.severity);
-        json.key("code");
-        json.value(message.code);
-        json.key("text");
-        json.value(message.text);
-        json.endObject();
+    std::string text = "{\n  \"status\": ";
+    appendNumber(text, status);
+    text += ",\n  \"records\": [";
+    buffer.write(text);
+    bool first = true;
+    for (const ZrRecord* record : records) {
+        buffer.write(first ? "\n" : ",\n");
+        first = false;
+        writeRecord(buffer, text, *record);
     }
-    json.endArray();
-    json.endObject();
-    json.endDocument();
+    text.assign(records.empty() ? "],\n  \"messages\": [" : "\n  ],\n  \"messages\": [");
+    for (size_t i = 0; i < messages.size(); ++i) {
+        text += i == 0 ? "\n    {\n      \"severity\": " : ",\n    {\n      \"severity\": ";
+        appendNumber(text, messages[i].severity);
+        text += ",\n      \"code\": ";
+        appendNumber(text, messages[i].code);
+        text += ",\n      \"text\": ";
+        appendQuoted(text, messages[i].text);
+        text += "\n    }";
+    }
+    text += messages.empty() ? "]\n}\n" : "\n  ]\n}\n";
+    buffer.write(text);
 }
 
 void printRecordsText(std::ostream& out, const std::vector<const ZrRecord*>& records) {

@@ -6,6 +6,7 @@
 #include <cerrno>
 #include <cstdlib>
 #include <gtest/gtest.h>
+#include <limits>
 #include <nlohmann/json.hpp>
 #include <sstream>
 
@@ -86,7 +87,7 @@ Json referenceRecord(const ZrRecord& record) {
 TEST(RecordDocument, SameBytesAsTheDocumentLibrary) {
     ZrRecordList list;
     ZrRecord* order = addRecord(list, u"order", {});
-    order->RecordLength(-42);
+    order->RecordLength(std::numeric_limits<long>::min());
     const char* const definitions[] = {
         "Number;alias=int;signed;display;maxlength=11;precision=10;usage=48",
         "Number;alias=uint;signed=false;maxlength=' 7';usage=49",

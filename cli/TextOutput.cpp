@@ -1,21 +1,19 @@
-#include "JsonWriter.h"
+#include "TextOutput.h"
 
-#include <charconv>
-
-OutputBuffer::OutputBuffer(std::ostream& out) : out_(out) { pending_.reserve(kFlushAt + 4096); }
+OutputBuffer::OutputBuffer(std::ostream& out) : out_(out) { pending_.reserve(kFlushAt); }
 
 OutputBuffer::~OutputBuffer() { flush(); }
 
-void OutputBuffer::spaces(size_t count) {
-    pending_.append(count, ' ');
-    if (pending_.size() >= kFlushAt)
+void OutputBuffer::write(std::string_view text) {
+    if (pending_.size() + text.size() > kFlushAt) {
         flush();
-}
-
-void OutputBuffer::number(long long value) {
-    char digits[24];
-    const auto result = std::to_chars(digits, digits + sizeof digits, value);
-    write(std::string_view(digits, static_cast<size_t>(result.ptr - digits)));
+        // A piece larger than the buffer goes straight to the stream.
+        if (text.size() >= kFlushAt) {
+            out_.write(text.data(), static_cast<std::streamsize>(text.size()));
+            return;
+        }
+    }
+    pending_.append(text);
 }
 
 void OutputBuffer::flush() {
@@ -221,78 +219,3 @@ void appendJsonEscaped(std::string& out, std::u16string_view text) {
         }
     }
 }
-
-void JsonWriter::newMember() {
-    if (hasMembers_.empty())
-        return;
-    out_.write(hasMembers_.back() ? std::string_view(",\n") : std::string_view("\n"));
-    hasMembers_.back() = true;
-    out_.spaces(2 * hasMembers_.size());
-}
-
-void JsonWriter::beforeValue() {
-    if (afterKey_)
-        afterKey_ = false;
-    else
-        newMember();
-}
-
-void JsonWriter::open(char bracket) {
-    beforeValue();
-    out_.put(bracket);
-    hasMembers_.push_back(false);
-}
-
-void JsonWriter::close(char bracket) {
-    const bool hadMembers = hasMembers_.back();
-    hasMembers_.pop_back();
-    if (hadMembers) {
-        out_.put('\n');
-        out_.spaces(2 * hasMembers_.size());
-    }
-    out_.put(bracket);
-}
-
-void JsonWriter::beginObject() { open('{'); }
-
-void JsonWriter::endObject() { close('}'); }
-
-void JsonWriter::beginArray() { open('['); }
-
-void JsonWriter::endArray() { close(']'); }
-
-template <class Text> void JsonWriter::string(Text text) {
-    scratch_.assign(1, '"');
-    appendJsonEscaped(scratch_, text);
-    scratch_ += '"';
-    out_.write(scratch_);
-}
-
-void JsonWriter::key(std::string_view name) {
-    newMember();
-    string(name);
-    out_.write(": ");
-    afterKey_ = true;
-}
-
-void JsonWriter::value(std::string_view text) {
-    beforeValue();
-    string(text);
-}
-
-void JsonWriter::value(std::u16string_view text) {
-    beforeValue();
-    string(text);
-}
-
-void JsonWriter::value(long long number) {
-    beforeValue();
-    out_.number(number);
-}
-
-void JsonWriter::value(bool truth) {
-    beforeValue();
-    out_.write(truth ? std::string_view("true") : std::string_view("false"));
-}
-
-void JsonWriter::endDocument() { out_.put('\n'); }

@@ -1,13 +1,12 @@
-// Output written as it is produced: a buffer in front of a stream, and a JSON writer
-// that streams documents through it in exactly the layout nlohmann-json's
-// dump(2) gives (two-space indent, "key": value, [] and {} when empty), so that
-// programs reading zrdict's output see the same bytes whichever built them.
+// Output written as it is produced: a buffer in front of a stream, the conversions
+// of host text to UTF-8, and JSON string escaping exactly as nlohmann-json escapes
+// (which built zrdict's documents before), so programs reading zrdict's output see
+// the same bytes.
 #pragma once
 
 #include <ostream>
 #include <string>
 #include <string_view>
-#include <vector>
 
 // Gathers bytes and hands them to the stream in large pieces. Flushes when
 // destroyed; write errors are the stream's to report.
@@ -18,20 +17,9 @@ class OutputBuffer {
     OutputBuffer(const OutputBuffer&) = delete;
     OutputBuffer& operator=(const OutputBuffer&) = delete;
 
-    void put(char c) {
-        pending_.push_back(c);
-        if (pending_.size() >= kFlushAt)
-            flush();
-    }
+    void put(char c) { write(std::string_view(&c, 1)); }
 
-    void write(std::string_view text) {
-        pending_.append(text);
-        if (pending_.size() >= kFlushAt)
-            flush();
-    }
-
-    void spaces(size_t count);
-    void number(long long value);
+    void write(std::string_view text);
     void flush();
 
   private:
@@ -61,44 +49,3 @@ void appendJsonEscaped(std::string& out, std::string_view text);
 // The same for 16-bit host text, which is converted on the way: a surrogate
 // without its partner becomes U+FFFD.
 void appendJsonEscaped(std::string& out, std::u16string_view text);
-
-// Streams one JSON document. Calls must nest properly: a key before each value in
-// an object, begin and end paired. The writer does not check.
-class JsonWriter {
-  public:
-    explicit JsonWriter(OutputBuffer& out) : out_(out) {}
-
-    void beginObject();
-    void endObject();
-    void beginArray();
-    void endArray();
-    void key(std::string_view name);
-    void value(std::string_view text);
-    void value(std::u16string_view text);
-
-    void value(const char* text) { value(std::string_view(text ? text : "")); }
-
-    void value(long long number);
-
-    void value(long number) { value(static_cast<long long>(number)); }
-
-    void value(int number) { value(static_cast<long long>(number)); }
-
-    void value(short number) { value(static_cast<long long>(number)); }
-
-    void value(bool truth);
-    // Ends the document with the newline zrdict puts after every document.
-    void endDocument();
-
-  private:
-    void beforeValue();
-    void newMember();
-    void open(char bracket);
-    void close(char bracket);
-    template <class Text> void string(Text text);
-
-    OutputBuffer& out_;
-    std::vector<bool> hasMembers_; // one per open container
-    bool afterKey_ = false;
-    std::string scratch_;
-};
