@@ -2,6 +2,7 @@
 
 #include "TextOutput.h"
 
+#include <algorithm>
 #include <cerrno>
 #include <charconv>
 #include <cstdlib>
@@ -146,11 +147,6 @@ size_t displayWidth(std::string_view text) {
     return width;
 }
 
-size_t digitCount(long long value) {
-    char digits[24];
-    return static_cast<size_t>(std::to_chars(digits, digits + sizeof digits, value).ptr - digits);
-}
-
 // The columns of a record's table, in order; numbers are right-aligned and the
 // last column is not padded, so lines carry no trailing blanks.
 enum Column { kField, kType, kUsage, kLength, kPrecision, kDecimals, kNulls, kColumns };
@@ -161,85 +157,93 @@ constexpr std::string_view kTitles[kColumns] = {"field",     "type",     "usage"
 class RecordTable {
   public:
     void print(OutputBuffer& out, const ZrRecord& record) {
-        fields_.clear();
-        for (int i = 0; i < record.FieldCount(); ++i)
-            if (const ZrField* field = record.GetFieldbyPos(i))
-                fields_.push_back(field);
-        if (names_.size() < fields_.size())
-            names_.resize(fields_.size());
+        size_t count = 0;
         for (size_t c = 0; c < kColumns; ++c)
             widths_[c] = kTitles[c].size();
-        for (size_t f = 0; f < fields_.size(); ++f) {
-            names_[f].clear();
-            appendUtf8(names_[f], fields_[f]->FieldName().view());
-            const ZrDType& type = fields_[f]->DataType();
-            widen(kField, displayWidth(names_[f]));
-            widen(kType, displayWidth(type.Alias()));
-            widen(kUsage, digitCount(type.Usage()));
-            widen(kLength, digitCount(type.Length()));
-            widen(kPrecision, digitCount(type.Precision()));
-            widen(kDecimals, digitCount(type.DecimalPlaces()));
-            widen(kNulls, type.Nulls() ? 3 : 2);
+        for (int i = 0; i < record.FieldCount(); ++i) {
+            const ZrField* field = record.GetFieldbyPos(i);
+            if (!field)
+                continue;
+            if (rows_.size() <= count)
+                rows_.emplace_back();
+            Row& row = rows_[count++];
+            const ZrDType& type = field->DataType();
+            row.name.clear();
+            appendUtf8(row.name, field->FieldName().view());
+            row.alias = type.Alias();
+            row.widths[kField] = displayWidth(row.name);
+            row.widths[kType] = displayWidth(row.alias);
+            row.numbers.clear();
+            const long long numbers[] = {type.Usage(), type.Length(), type.Precision(),
+                                         type.DecimalPlaces()};
+            for (size_t n = 0; n < 4; ++n) {
+                const size_t before = row.numbers.size();
+                appendNumber(row.numbers, numbers[n]);
+                row.widths[kUsage + n] = row.numbers.size() - before;
+            }
+            row.nulls = type.Nulls();
+            row.widths[kNulls] = row.nulls ? 3 : 2;
+            for (size_t c = 0; c < kColumns; ++c)
+                widths_[c] = std::max(widths_[c], row.widths[c]);
         }
 
-        line_.clear();
-        appendUtf8(line_, record.name.view());
-        line_ += " (length ";
-        appendNumber(line_, record.RecordLength());
-        line_ += ", ";
-        appendNumber(line_, record.FieldCount());
-        line_ += record.FieldCount() == 1 ? " field)\n" : " fields)\n";
-        line_ += "  ";
-        for (size_t c = 0; c < kColumns; ++c) {
-            const bool right = c >= kUsage && c <= kDecimals;
-            cell(c, kTitles[c], kTitles[c].size(), right);
-        }
-        line_ += '\n';
-        out.write(line_);
+        text_.clear();
+        appendUtf8(text_, record.name.view());
+        text_ += " (length ";
+        appendNumber(text_, record.RecordLength());
+        text_ += ", ";
+        appendNumber(text_, record.FieldCount());
+        text_ += record.FieldCount() == 1 ? " field)\n  " : " fields)\n  ";
+        for (size_t c = 0; c < kColumns; ++c)
+            cell(c, kTitles[c], kTitles[c].size());
+        text_ += '\n';
 
-        for (size_t f = 0; f < fields_.size(); ++f) {
-            const ZrDType& type = fields_[f]->DataType();
-            line_.assign("  ");
-            cell(kField, names_[f], displayWidth(names_[f]), false);
-            const std::string_view alias = type.Alias();
-            cell(kType, alias, displayWidth(alias), false);
-            number(kUsage, type.Usage());
-            number(kLength, type.Length());
-            number(kPrecision, type.Precision());
-            number(kDecimals, type.DecimalPlaces());
-            cell(kNulls, type.Nulls() ? "yes" : "no", 0, false);
-            line_ += '\n';
-            out.write(line_);
+        for (size_t f = 0; f < count; ++f) {
+            const Row& row = rows_[f];
+            text_ += "  ";
+            cell(kField, row.name, row.widths[kField]);
+            cell(kType, row.alias, row.widths[kType]);
+            size_t at = 0;
+            for (size_t c = kUsage; c <= kDecimals; ++c) {
+                cell(c, std::string_view(row.numbers).substr(at, row.widths[c]), row.widths[c]);
+                at += row.widths[c];
+            }
+            cell(kNulls, row.nulls ? "yes" : "no", row.widths[kNulls]);
+            text_ += '\n';
+            // A record of many fields goes out in pieces, not held whole.
+            if (text_.size() >= (1 << 16)) {
+                out.write(text_);
+                text_.clear();
+            }
         }
+        out.write(text_);
     }
 
   private:
-    void widen(size_t column, size_t width) {
-        if (width > widths_[column])
-            widths_[column] = width;
-    }
+    // A field's cells as they are printed, with their display widths.
+    struct Row {
+        std::string name;
+        std::string_view alias;
+        std::string numbers; // usage, length, precision and decimals, one after another
+        bool nulls = false;
+        size_t widths[kColumns] = {};
+    };
 
-    void cell(size_t column, std::string_view text, size_t width, bool right) {
+    void cell(size_t column, std::string_view text, size_t width) {
         if (column > 0)
-            line_ += "  ";
+            text_ += "  ";
         const size_t padding = column + 1 < kColumns ? widths_[column] - width : 0;
+        const bool right = column >= kUsage && column <= kDecimals;
         if (right)
-            line_.append(padding, ' ');
-        line_ += text;
+            text_.append(padding, ' ');
+        text_ += text;
         if (!right)
-            line_.append(padding, ' ');
+            text_.append(padding, ' ');
     }
 
-    void number(size_t column, long long value) {
-        line_ += "  ";
-        line_.append(widths_[column] - digitCount(value), ' ');
-        appendNumber(line_, value);
-    }
-
-    std::vector<const ZrField*> fields_;
-    std::vector<std::string> names_;
+    std::vector<Row> rows_;
     size_t widths_[kColumns] = {};
-    std::string line_;
+    std::string text_;
 };
 
 // --- links between records ----------------------------------------------------------
