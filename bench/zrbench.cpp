@@ -10,7 +10,7 @@
 // copy of the records into the dictionary; and the peak of live heap bytes during
 // one read, counted by the allocation functions this program replaces (the parser
 // allocates through them too).
-#include "ParserConfig.h"
+#include "Floor.h"
 #include "SchemaGenerator.h"
 #include "ZrName.h"
 #include "ZrXmlSchemaDict.h"
@@ -147,81 +147,10 @@ void operator delete[](void* p, std::align_val_t, const std::nothrow_t&) noexcep
 namespace {
 
 using namespace xercesc;
+using namespace zrfloor;
 namespace fs = std::filesystem;
 
 constexpr double kMB = 1024.0 * 1024.0;
-
-std::string utf8(const XMLCh* text) {
-    char* s = XMLString::transcode(text);
-    std::string out = s ? s : "";
-    XMLString::release(&s);
-    return out;
-}
-
-// --- the floor ----------------------------------------------------------------------
-
-// True for a location the reader uses as written: a leading slash or backslash, or
-// a drive letter and colon.
-bool absoluteLocation(const std::string& location) {
-    return !location.empty() &&
-           (location[0] == '/' || location[0] == '\\' ||
-            (location.size() > 1 && location[1] == ':' && std::isalpha((unsigned char)location[0])));
-}
-
-// A scheme such as "http:" or "file:": two or more letters and a colon.
-bool hasScheme(const std::string& location) {
-    size_t letters = 0;
-    while (letters < location.size() && std::isalpha((unsigned char)location[letters]))
-        ++letters;
-    return letters >= 2 && letters < location.size() && location[letters] == ':';
-}
-
-std::string directoryOf(const std::string& path) {
-    const size_t slash = path.find_last_of("/\\");
-    return slash == std::string::npos ? std::string() : path.substr(0, slash + 1);
-}
-
-// Where the reader looks for an included document: a relative location is taken
-// from the directory of the including document, its own directory part kept.
-std::string includedPath(const std::string& including, const std::string& location) {
-    if (hasScheme(including) || hasScheme(location) || absoluteLocation(location))
-        return location;
-    return directoryOf(including) + location;
-}
-
-// The reader parses a document once however it is named: "a/../b.xsd" and "b.xsd"
-// are one document.
-std::string documentKey(const std::string& path) {
-    return std::filesystem::path(path).lexically_normal().string();
-}
-
-// Does no work but what reading the same documents needs: noting "include" elements.
-class FloorHandler : public HandlerBase {
-  public:
-    void startElement(const XMLCh* name, AttributeList& attrs) override {
-        const XMLCh* local = name;
-        for (const XMLCh* p = name; *p; ++p)
-            if (*p == u':')
-                local = p + 1;
-        if (!XMLString::equals(local, u"include"))
-            return;
-        if (const XMLCh* location = attrs.getValue(u"schemaLocation"))
-            includes.push_back(utf8(location));
-    }
-
-    void error(const SAXParseException& e) override { fail(e); }
-
-    void fatalError(const SAXParseException& e) override { fail(e); }
-
-    std::vector<std::string> includes;
-    std::string firstError;
-
-  private:
-    void fail(const SAXParseException& e) {
-        if (firstError.empty())
-            firstError = utf8(e.getSystemId()) + ": " + utf8(e.getMessage());
-    }
-};
 
 // The least a reader that resolves references by name adds to the parse, as a
 // reference point between the floor and the read: the values of the attributes the
@@ -251,6 +180,7 @@ class KeepingHandler : public FloorHandler {
         uint64_t hash = 0;
         size_t offset = 0;
         size_t size = 0; // 0: a free slot (empty texts are not entered)
+
         bool free() const { return size == 0; }
     };
 
@@ -292,36 +222,10 @@ class KeepingHandler : public FloorHandler {
     size_t entered_ = 0;
 };
 
-// Parses `mainPath` and every document it includes, once each, in the reader's
-// order, with the floor's handler or the keeping one. Returns the documents parsed;
-// throws when one of them fails.
-std::vector<std::string> runFloor(const std::string& mainPath, bool keeping = false) {
-    // The reader's own parser class: the same configuration and the same DTD hooks.
-    SchemaParser parser;
-    FloorHandler plain;
+// The floor with the keeping handler.
+std::vector<std::string> runKeptFloor(const std::string& mainPath) {
     KeepingHandler keeper;
-    FloorHandler& handler = keeping ? keeper : plain;
-    parser.setDocumentHandler(&handler);
-    parser.setErrorHandler(&handler);
-
-    std::vector<std::string> parsed;
-    std::set<std::string> queued{documentKey(mainPath)};
-    std::deque<std::string> queue{mainPath};
-    while (!queue.empty()) {
-        const std::string path = queue.front();
-        queue.pop_front();
-        handler.includes.clear();
-        parser.parse(path.c_str());
-        if (!handler.firstError.empty())
-            throw std::runtime_error("floor parse failed: " + handler.firstError);
-        parsed.push_back(path);
-        for (const auto& location : handler.includes) {
-            std::string included = includedPath(path, location);
-            if (queued.insert(documentKey(included)).second)
-                queue.push_back(std::move(included));
-        }
-    }
-    return parsed;
+    return runFloor(mainPath, keeper);
 }
 
 // --- the read -----------------------------------------------------------------------
@@ -444,9 +348,8 @@ class CollectingReporter : public benchmark::ConsoleReporter {
         ConsoleReporter::ReportRuns(runs);
         for (const Run& run : runs) {
             // A single repetition has no aggregate: its one run is the fastest.
-            const bool fastest = run.run_type == Run::RT_Aggregate
-                                     ? run.aggregate_name == "min"
-                                     : run.repetitions <= 1;
+            const bool fastest = run.run_type == Run::RT_Aggregate ? run.aggregate_name == "min"
+                                                                   : run.repetitions <= 1;
             if (fastest && !run.error_occurred)
                 minimumSeconds[run.run_name.function_name] =
                     run.GetAdjustedRealTime() / 1e3; // the unit is milliseconds
@@ -494,7 +397,7 @@ void timeSet(SetResult& set, bool qualified, int repetitions, CollectingReporter
     configure(benchmark::RegisterBenchmark(keptName.c_str(), [mainPath](benchmark::State& state) {
         for (auto _ : state) {
             const double start = now();
-            runFloor(mainPath, true);
+            runKeptFloor(mainPath);
             state.SetIterationTime(now() - start);
         }
     }));

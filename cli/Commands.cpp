@@ -2,6 +2,7 @@
 
 #include "MessageLog.h"
 #include "PluginLibrary.h"
+#include "RecordOutput.h"
 #include "Render.h"
 #include "zrapi.h"
 #include "zrstring.h"
@@ -69,18 +70,23 @@ bool applyOptions(const Invocation& inv, const MessageLog& log, ZrDictBrowser& d
 }
 
 void printRecordResult(const Invocation& inv, const MessageLog& log, BATCHERR status,
-                       const std::vector<const ZrRecord*>& records) {
-    if (inv.format == OutputFormat::Json) {
-        Json doc;
-        doc["status"] = static_cast<int>(status);
-        Json list = Json::array();
-        for (const ZrRecord* record : records)
-            list.push_back(recordToJson(*record));
-        doc["records"] = std::move(list);
-        doc["messages"] = messagesToJson(log.messages());
-        printJson(std::cout, doc);
-    } else if (status == BE_OK) {
-        printRecordsText(std::cout, records);
+                       const std::vector<const ZrRecord*>& records, const ZrDictBrowser& dict) {
+    switch (inv.format) {
+    case OutputFormat::Json:
+        printRecordDocument(std::cout, static_cast<int>(status), records, log.messages());
+        return;
+    case OutputFormat::Text:
+        if (status == BE_OK)
+            printRecordsText(std::cout, records);
+        return;
+    case OutputFormat::Tree:
+        if (status == BE_OK)
+            printRecordTree(std::cout, records, dict.RecordList());
+        return;
+    case OutputFormat::Dot:
+        if (status == BE_OK)
+            printRecordGraph(std::cout, records, dict.RecordList());
+        return;
     }
 }
 
@@ -96,9 +102,10 @@ std::vector<const ZrRecord*> listedRecords(const ZrDictBrowser& dict, BATCHERR s
     return records;
 }
 
-int readFailed(const Invocation& inv, const MessageLog& log, BATCHERR status) {
-    printRecordResult(inv, log, status, {});
-    if (inv.format == OutputFormat::Text)
+int readFailed(const Invocation& inv, const MessageLog& log, BATCHERR status,
+               const ZrDictBrowser& dict) {
+    printRecordResult(inv, log, status, {}, dict);
+    if (inv.format != OutputFormat::Json)
         std::cerr << "zrdict: reading '" << inv.schema << "' failed (status "
                   << static_cast<int>(status) << ")\n";
     return ExitStatus::ReadFailed;
@@ -107,15 +114,15 @@ int readFailed(const Invocation& inv, const MessageLog& log, BATCHERR status) {
 int runRead(const Invocation& inv, const MessageLog& log, ZrDictBrowser& dict) {
     BATCHERR status = dict.ReadDictionary(inv.schema.c_str());
     if (status != BE_OK)
-        return readFailed(inv, log, status);
-    printRecordResult(inv, log, status, listedRecords(dict, status));
+        return readFailed(inv, log, status, dict);
+    printRecordResult(inv, log, status, listedRecords(dict, status), dict);
     return ExitStatus::Success;
 }
 
 int runFlatten(const Invocation& inv, const MessageLog& log, ZrDictBrowser& dict, ZrSpoke* spoke) {
     BATCHERR status = dict.ReadDictionary(inv.schema.c_str());
     if (status != BE_OK)
-        return readFailed(inv, log, status);
+        return readFailed(inv, log, status, dict);
     const ZrRecord* source = dict.RecordList()[ZrWString(zrUtf8ToUtf16(inv.record))];
     if (!source)
         return usageError(inv, log, "no record named '" + inv.record + "' in '" + inv.schema + "'");
@@ -125,9 +132,9 @@ int runFlatten(const Invocation& inv, const MessageLog& log, ZrDictBrowser& dict
     ZrRecord target;
     target.name = source->name;
     BATCHERR flattened = dict.FlattenDictRecord(source, &target, spoke);
-    printRecordResult(inv, log, flattened, {&target});
+    printRecordResult(inv, log, flattened, {&target}, dict);
     if (flattened != BE_OK) {
-        if (inv.format == OutputFormat::Text)
+        if (inv.format != OutputFormat::Json)
             std::cerr << "zrdict: flattening '" << inv.record << "' failed (status "
                       << static_cast<int>(flattened) << ")\n";
         return ExitStatus::FlattenFailed;
@@ -177,7 +184,7 @@ int reportUsageError(OutputFormat format, const std::string& text) {
 int runCommand(const Invocation& inv) {
     // Installed before the plug-in is loaded, so nothing it logs goes astray. In JSON
     // mode messages are only collected: stderr stays silent.
-    MessageLog log(inv.format == OutputFormat::Text);
+    MessageLog log(inv.format != OutputFormat::Json);
 
     std::string path = inv.pluginPath.empty() ? defaultPluginPath() : inv.pluginPath;
     PluginLibrary plugin;

@@ -13,7 +13,8 @@ constexpr int FlattenFailed = 5;
 constexpr int ReadFailed = 19;
 } // namespace ExitStatus
 
-enum class OutputFormat { Text, Json };
+// text and json for every command; tree and dot for the records of read and flatten.
+enum class OutputFormat { Text, Json, Tree, Dot };
 
 // What the command line asked for, once parsed.
 struct Invocation {

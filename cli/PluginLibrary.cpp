@@ -20,9 +20,15 @@ std::string defaultPluginPath() {
     std::error_code ec;
     fs::path exe = fs::read_symlink("/proc/self/exe", ec);
     if (!ec) {
-        fs::path beside = exe.parent_path() / kPluginFileName;
-        if (fs::exists(beside, ec))
-            return beside.string();
+        // Beside the program (the build tree's layout), then where an installation
+        // puts libraries relative to its programs.
+        for (const fs::path& dir :
+             {exe.parent_path(),
+              (exe.parent_path() / ZRDICT_INSTALL_PLUGIN_DIR).lexically_normal()}) {
+            fs::path candidate = dir / kPluginFileName;
+            if (fs::exists(candidate, ec))
+                return candidate.string();
+        }
     }
     return std::string(ZRDICT_BUILD_PLUGIN_DIR) + "/" + kPluginFileName;
 }

@@ -8,7 +8,8 @@
 #include <string>
 
 // The library to load when none is named: libzrbxmls.so next to this executable,
-// else the one in the build tree this program was built in.
+// else in the library folder of the installation it belongs to, else the one in
+// the build tree this program was built in.
 std::string defaultPluginPath();
 
 class PluginLibrary {

@@ -4,28 +4,8 @@
 #include "zrstring.h"
 
 #include <algorithm>
-#include <cerrno>
-#include <cstdlib>
 
 namespace {
-
-// Items of a definition string worth showing beside the fields every type has.
-// maxlength is a number; signed is a truth value; picture stays text.
-void addDefinitionItems(Json& out, const ZrDType& type) {
-    if (const char* maxLength = type.Item("maxlength")) {
-        char* end = nullptr;
-        errno = 0;
-        long value = std::strtol(maxLength, &end, 10);
-        if (end != maxLength && *end == '\0' && errno == 0)
-            out["maxlength"] = value;
-        else
-            out["maxlength"] = maxLength;
-    }
-    if (const char* picture = type.Item("picture"))
-        out["picture"] = picture;
-    if (const char* isSigned = type.Item("signed"))
-        out["signed"] = std::string(isSigned) == "true";
-}
 
 // Display width of UTF-8 text, counted in code points: close enough for the
 // names and aliases of a schema.
@@ -83,39 +63,6 @@ void printTable(std::ostream& out, const std::vector<Column>& columns, const std
 } // namespace
 
 std::string narrow(const ZrWString& text) { return zrUtf16ToUtf8(text.view()); }
-
-Json typeToJson(const ZrDType& type) {
-    Json out;
-    out["class"] = type.TypeClass();
-    out["alias"] = type.Alias();
-    out["usage"] = type.Usage();
-    out["length"] = type.Length();
-    out["precision"] = type.Precision();
-    out["decimals"] = type.DecimalPlaces();
-    out["nulls"] = type.Nulls();
-    addDefinitionItems(out, type);
-    return out;
-}
-
-Json recordToJson(const ZrRecord& record) {
-    Json out;
-    out["name"] = narrow(record.name);
-    out["length"] = record.RecordLength();
-    Json fields = Json::array();
-    for (int i = 0; i < record.FieldCount(); ++i) {
-        const ZrField* field = record.GetFieldbyPos(i);
-        if (!field)
-            continue;
-        Json entry;
-        entry["name"] = narrow(field->FieldName());
-        entry["alias"] = narrow(field->Alias());
-        entry["description"] = field->Description();
-        entry["type"] = typeToJson(field->DataType());
-        fields.push_back(std::move(entry));
-    }
-    out["fields"] = std::move(fields);
-    return out;
-}
 
 Json messagesToJson(const std::vector<LoggedMessage>& messages) {
     Json out = Json::array();
@@ -182,36 +129,6 @@ Json optionsToJson(const ZrDictBrowser& dict) {
 
 void printJson(std::ostream& out, const Json& document) {
     out << document.dump(2, ' ', false, Json::error_handler_t::replace) << '\n';
-}
-
-void printRecordsText(std::ostream& out, const std::vector<const ZrRecord*>& records) {
-    if (records.empty()) {
-        out << "(no records)\n";
-        return;
-    }
-    static const std::vector<Column> kColumns = {
-        {"field", false},    {"type", false},    {"usage", true},  {"length", true},
-        {"precision", true}, {"decimals", true}, {"nulls", false},
-    };
-    bool first = true;
-    for (const ZrRecord* record : records) {
-        if (!first)
-            out << '\n';
-        first = false;
-        out << narrow(record->name) << " (length " << record->RecordLength() << ", "
-            << record->FieldCount() << (record->FieldCount() == 1 ? " field)" : " fields)") << '\n';
-        std::vector<Row> rows;
-        for (int i = 0; i < record->FieldCount(); ++i) {
-            const ZrField* field = record->GetFieldbyPos(i);
-            if (!field)
-                continue;
-            const ZrDType& type = field->DataType();
-            rows.push_back({narrow(field->FieldName()), type.Alias(), std::to_string(type.Usage()),
-                            std::to_string(type.Length()), std::to_string(type.Precision()),
-                            std::to_string(type.DecimalPlaces()), type.Nulls() ? "yes" : "no"});
-        }
-        printTable(out, kColumns, rows, "  ");
-    }
 }
 
 void printTypesText(std::ostream& out, const char* const* definitions) {

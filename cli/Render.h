@@ -1,4 +1,6 @@
-// What zrdict prints: JSON documents for programs and aligned tables for people.
+// What zrdict prints about the plug-in itself (options, types) and on usage errors:
+// small JSON documents for programs and aligned tables for people. Records are
+// printed by RecordOutput.h.
 #pragma once
 
 #include "MessageLog.h"
@@ -11,8 +13,6 @@
 
 using Json = nlohmann::ordered_json;
 
-Json typeToJson(const ZrDType& type);
-Json recordToJson(const ZrRecord& record);
 Json messagesToJson(const std::vector<LoggedMessage>& messages);
 // One entry per type-definition string, up to the terminating null.
 Json typeDefinitionsToJson(const char* const* definitions);
@@ -23,7 +23,6 @@ Json optionsToJson(const ZrDictBrowser& dict);
 // rather than failing the whole output.
 void printJson(std::ostream& out, const Json& document);
 
-void printRecordsText(std::ostream& out, const std::vector<const ZrRecord*>& records);
 void printTypesText(std::ostream& out, const char* const* definitions);
 void printOptionsText(std::ostream& out, const ZrDictBrowser& dict);
 

@@ -2,6 +2,7 @@
 // at run time and drives it only through the dictionary-browser interface, as the
 // engine does, so what it prints is what the engine would see.
 #include "Commands.h"
+#include "Help.h"
 
 #include <CLI/CLI.hpp>
 #include <cstring>
@@ -12,6 +13,16 @@ namespace {
 constexpr const char* kExitStatusHelp =
     "Exit status: 0 success, 2 usage error, 3 plug-in not loaded, 5 flattening failed,\n"
     "19 the read failed (the messages say why).";
+
+OutputFormat formatNamed(const std::string& name) {
+    if (name == "json")
+        return OutputFormat::Json;
+    if (name == "tree")
+        return OutputFormat::Tree;
+    if (name == "dot")
+        return OutputFormat::Dot;
+    return OutputFormat::Text;
+}
 
 // CLI11 reports usage errors before the --format option has been stored, yet a
 // program that asked for JSON expects JSON even then; so look for it directly.
@@ -29,8 +40,8 @@ OutputFormat requestedFormat(int argc, char** argv) {
 // Every subcommand takes --plugin too, so it may stand before or after the name.
 void addPluginOption(CLI::App& app, std::string& path) {
     app.add_option("--plugin", path,
-                   "Plug-in library to load (default: libzrbxmls.so beside "
-                   "zrdict, else the build tree's)")
+                   "Plug-in library to load (default: libzrbxmls.so beside zrdict, else in "
+                   "the installation's library folder, else the build tree's)")
         ->type_name("PATH");
 }
 
@@ -38,6 +49,15 @@ void addFormatOption(CLI::App& app, std::string& format) {
     app.add_option("--format", format, "Output: text for people (default) or json for programs")
         ->type_name("FORMAT")
         ->check(CLI::IsMember({"text", "json"}));
+}
+
+// read and flatten print records, which have two more views.
+void addRecordFormatOption(CLI::App& app, std::string& format) {
+    app.add_option("--format", format,
+                   "Output: text, tables for people (default); json, one document for "
+                   "programs; tree, how records nest; dot, a Graphviz graph of the records")
+        ->type_name("FORMAT")
+        ->check(CLI::IsMember({"text", "json", "tree", "dot"}));
 }
 
 void addOptionOption(CLI::App& app, std::vector<std::string>& options) {
@@ -65,15 +85,20 @@ int main(int argc, char** argv) {
     CLI::App app{"Reads XML Schema documents into record dictionaries through the zrbxmls "
                  "plug-in.",
                  "zrdict"};
+    app.footer([&inv] { return mainHelpFooter(inv.pluginPath); });
     app.set_version_flag("--version", std::string("zrdict ") + ZRDICT_VERSION);
     app.require_subcommand(1);
     app.footer(kExitStatusHelp);
     addPluginOption(app, inv.pluginPath);
+    // Help is printed once the command line is parsed, so a --plugin given with
+    // --help names the plug-in whose options are listed.
+    auto optionsFooter = [&inv] { return pluginOptionsHelp(inv.pluginPath); };
 
     CLI::App* read = app.add_subcommand("read", "Read SCHEMA and print its records");
     addPluginOption(*read, inv.pluginPath);
     addOptionOption(*read, inv.options);
-    addFormatOption(*read, format);
+    addRecordFormatOption(*read, format);
+    read->footer([&inv] { return readHelpFooter(inv.pluginPath); });
     read->add_option("SCHEMA", inv.schema, "Schema document")->type_name("PATH")->required();
 
     CLI::App* options =
@@ -81,6 +106,7 @@ int main(int argc, char** argv) {
     addPluginOption(*options, inv.pluginPath);
     addOptionOption(*options, inv.options);
     addFormatOption(*options, format);
+    options->footer(optionsFooter);
 
     CLI::App* types =
         app.add_subcommand("types", "List the plug-in's built-in type definitions in order");
@@ -91,7 +117,8 @@ int main(int argc, char** argv) {
         "flatten", "Read SCHEMA, flatten its record RECORD into a new record and print that");
     addPluginOption(*flatten, inv.pluginPath);
     addOptionOption(*flatten, inv.options);
-    addFormatOption(*flatten, format);
+    addRecordFormatOption(*flatten, format);
+    flatten->footer(optionsFooter);
     flatten
         ->add_option("--spoke", inv.spoke,
                      "Sample connector that translates data types (text: every type becomes "
@@ -124,7 +151,7 @@ int main(int argc, char** argv) {
         return ExitStatus::Usage;
     }
 
-    inv.format = format == "json" ? OutputFormat::Json : OutputFormat::Text;
+    inv.format = formatNamed(format);
     for (CLI::App* command : {read, options, types, flatten})
         if (command->parsed())
             inv.command = command->get_name();

@@ -4,7 +4,9 @@
 
 #include <cstdlib>
 #include <filesystem>
+#include <fstream>
 #include <gtest/gtest.h>
+#include <sstream>
 
 namespace fs = std::filesystem;
 
@@ -73,6 +75,17 @@ const StatusCase kStatusCases[] = {
     {"ReadMissingFile", {"read", "/nonexistent/missing.xsd"}, 19, "fatal 4: Schema: Fatal: "},
     {"FlattenExample", {"flatten", "--spoke", "text", example(), "item"}, 0, nullptr},
     {"FlattenMissingFile", {"flatten", "/nonexistent/missing.xsd", "item"}, 19, nullptr},
+    {"ReadTree", {"read", "--format", "tree", example()}, 0, nullptr},
+    {"ReadDot", {"read", "--format=dot", example()}, 0, nullptr},
+    {"FlattenTree", {"flatten", "--format", "tree", example(), "item"}, 0, nullptr},
+    {"TreeMissingFile",
+     {"read", "--format", "tree", "/nonexistent/missing.xsd"},
+     19,
+     "fatal 4: Schema: Fatal: "},
+    {"DotMissingFile", {"read", "--format", "dot", "/nonexistent/missing.xsd"}, 19, "fatal 4: "},
+    {"TreeOnlyForRecords", {"options", "--format", "tree"}, 2, "tree"},
+    {"DotOnlyForRecords", {"types", "--format", "dot"}, 2, "dot"},
+    {"HelpWithMissingPlugin", {"read", "--help", "--plugin", "/nonexistent/lib.so"}, 0, nullptr},
 };
 
 // Test listings show the row's label rather than its bytes.
@@ -104,6 +117,84 @@ TEST(Usage, HelpAndVersionGoToStdout) {
         EXPECT_TRUE(contains(commandHelp.out, part)) << commandHelp.out;
     RunResult version = runZrdict({"--version"});
     EXPECT_TRUE(startsWith(version.out, "zrdict ")) << version.out;
+}
+
+std::string indented(const std::string& text) {
+    std::string out;
+    for (size_t start = 0; start < text.size();) {
+        size_t end = text.find('\n', start);
+        if (end > start)
+            out += "  ";
+        out += text.substr(start, end - start + 1);
+        start = end + 1;
+    }
+    return out;
+}
+
+std::string readFile(const std::string& path) {
+    std::ifstream in(path, std::ios::binary);
+    std::ostringstream text;
+    text << in.rdbuf();
+    return text.str();
+}
+
+// The help's worked example is what zrdict really prints for the example schema it
+// shows, and the plug-in's options come from the plug-in.
+TEST(Usage, HelpShowsAWorkedExampleAndThePluginsOptions) {
+    const std::string schema = examplesDir() + "/order.xsd";
+    RunResult tree = runZrdict({"read", "--format", "tree", schema});
+    RunResult tables = runZrdict({"read", schema});
+    ASSERT_EQ(tree.exitStatus, 0);
+    ASSERT_EQ(tables.exitStatus, 0);
+    const std::string options = "--option NAME=VALUE ('zrdict options' shows their values):\n"
+                                "  QualifiedRecordNames  default False  Strip leading blanks\n";
+
+    RunResult help = runZrdict({"--help"});
+    EXPECT_TRUE(contains(help.out, indented(readFile(schema)))) << help.out;
+    EXPECT_TRUE(
+        contains(help.out, "  $ zrdict read --format tree order.xsd\n" + indented(tree.out)))
+        << help.out;
+    EXPECT_TRUE(contains(help.out, options)) << help.out;
+
+    RunResult readHelp = runZrdict({"read", "--help"});
+    EXPECT_TRUE(contains(readHelp.out, indented(readFile(schema)))) << readHelp.out;
+    EXPECT_TRUE(contains(readHelp.out, "  $ zrdict read order.xsd\n" + indented(tables.out)))
+        << readHelp.out;
+    EXPECT_TRUE(contains(readHelp.out, options)) << readHelp.out;
+    EXPECT_TRUE(contains(readHelp.out, "{text,json,tree,dot}")) << readHelp.out;
+
+    RunResult withoutPlugin = runZrdict({"--help", "--plugin", "/nonexistent/lib.so"});
+    EXPECT_EQ(withoutPlugin.exitStatus, 0);
+    EXPECT_TRUE(contains(withoutPlugin.out, "Plug-in options: not listed, cannot load plug-in "
+                                            "'/nonexistent/lib.so'"))
+        << withoutPlugin.out;
+}
+
+TEST(Read, TreeOpensNestedRecordsInPlaceAndEachOnce) {
+    RunResult run =
+        runZrdict({"read", "--format", "tree", dataDir() + "/e2e/shared-and-recursive.xsd"});
+    ASSERT_EQ(run.exitStatus, 0) << run.err;
+    EXPECT_EQ(run.err, "");
+    EXPECT_EQ(run.out, "catalog (length 0)\n"
+                       "├── node: Record, length 0\n"
+                       "│   ├── label: string, length 0\n"
+                       "│   └── node: Record, length 0 (recursive)\n"
+                       "└── party: Record, length 0\n"
+                       "    └── name: string, length 0\n"
+                       "invoice (length 0)\n"
+                       "├── party: Record, length 0 (shown above)\n"
+                       "└── total: decimal, length 0\n");
+}
+
+TEST(Read, DotIsADigraphWithANodePerRecord) {
+    RunResult run =
+        runZrdict({"read", "--format", "dot", dataDir() + "/e2e/shared-and-recursive.xsd"});
+    ASSERT_EQ(run.exitStatus, 0) << run.err;
+    EXPECT_TRUE(startsWith(run.out, "digraph records {\n")) << run.out;
+    for (const char* part : {"  r0 -> r1 [label=\"node\"];\n", "  r0 -> r2 [label=\"party\"];\n",
+                             "  r1 -> r1 [label=\"node\"];\n", "  r3 -> r2 [label=\"party\"];\n",
+                             "<b>invoice</b></td></tr><tr><td align=\"left\">total</td>"})
+        EXPECT_TRUE(contains(run.out, part)) << part << " in\n" << run.out;
 }
 
 // A program that asks for JSON gets one JSON document on stdout and nothing on

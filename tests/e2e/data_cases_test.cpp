@@ -21,6 +21,7 @@
 #include <fstream>
 #include <gtest/gtest.h>
 #include <sstream>
+#include <unistd.h>
 
 namespace fs = std::filesystem;
 
@@ -71,14 +72,14 @@ std::vector<std::string> readArgs(const fs::path& path) {
     return args;
 }
 
-std::vector<std::string> commandLine(const std::string& name) {
+std::vector<std::string> commandLine(const std::string& name, const std::string& format = "json") {
     std::vector<std::string> extra = readArgs(caseDir() / (name + ".args"));
     std::string command = "read";
     if (!extra.empty() && extra.front() == "flatten") {
         command = extra.front();
         extra.erase(extra.begin());
     }
-    std::vector<std::string> args = {command, "--format", "json", name + ".xsd"};
+    std::vector<std::string> args = {command, "--format", format, name + ".xsd"};
     args.insert(args.end(), extra.begin(), extra.end());
     return args;
 }
@@ -134,6 +135,58 @@ TEST_P(SchemaFiles, PrintExpectedJson) {
     EXPECT_EQ(expected, actual) << "differences (JSON patch from expected to actual):\n"
                                 << Json::diff(expected, actual).dump(2) << "\nactual:\n"
                                 << actual.dump(2);
+    // Programs may compare the output as text: the bytes are fixed too.
+    EXPECT_EQ(run.out, expectedText);
+}
+
+// The views for people show every record the JSON lists, and fail as the read does.
+TEST_P(SchemaFiles, TreeShowsEveryRecord) {
+    const std::string& name = GetParam();
+    RunResult json = runZrdict(commandLine(name), caseDir().string());
+    RunResult tree = runZrdict(commandLine(name, "tree"), caseDir().string());
+    EXPECT_EQ(tree.exitStatus, json.exitStatus) << tree.err;
+    Json doc = json.json();
+    if (!doc.contains("records"))
+        return;
+    for (const Json& record : doc["records"]) {
+        const std::string recordName = record["name"];
+        EXPECT_TRUE(tree.out.find(recordName) != std::string::npos) << recordName << " in\n"
+                                                                    << tree.out;
+    }
+}
+
+// Graphviz's own program, where it is installed.
+std::string dotProgram() {
+    const char* path = std::getenv("PATH");
+    std::string dirs = path ? path : "/usr/bin";
+    for (size_t start = 0; start <= dirs.size();) {
+        size_t end = std::min(dirs.find(':', start), dirs.size());
+        fs::path candidate = fs::path(dirs.substr(start, end - start)) / "dot";
+        if (!candidate.parent_path().empty() && access(candidate.c_str(), X_OK) == 0)
+            return candidate.string();
+        start = end + 1;
+    }
+    return {};
+}
+
+TEST_P(SchemaFiles, GraphvizAcceptsTheGraph) {
+    const std::string dot = dotProgram();
+    if (dot.empty())
+        GTEST_SKIP() << "Graphviz's dot is not installed";
+    const std::string& name = GetParam();
+    RunResult graph = runZrdict(commandLine(name, "dot"), caseDir().string());
+    if (graph.exitStatus != 0)
+        return; // a failed read prints no graph
+    std::string pattern = (fs::temp_directory_path() / "zre2e-dot-XXXXXX").string();
+    int fd = mkstemp(pattern.data());
+    ASSERT_GE(fd, 0);
+    close(fd);
+    std::ofstream(pattern, std::ios::binary) << graph.out;
+    RunResult svg = runZrdict({"-Tsvg", pattern}, {}, dot);
+    fs::remove(pattern);
+    EXPECT_EQ(svg.exitStatus, 0) << svg.err << "\nfor:\n" << graph.out;
+    EXPECT_EQ(svg.err, "") << graph.out;
+    EXPECT_NE(svg.out.find("<svg"), std::string::npos);
 }
 
 INSTANTIATE_TEST_SUITE_P(E2E, SchemaFiles, ::testing::ValuesIn(listCases()), testName);

@@ -1,0 +1,120 @@
+// zrdict's JSON string escaping and UTF-8 conversions against nlohmann-json, which
+// wrote zrdict's output before, and the host's own conversion: the same bytes,
+// ill-formed text included.
+#include "TextOutput.h"
+#include "zrstring.h"
+
+#include <gtest/gtest.h>
+#include <nlohmann/json.hpp>
+#include <random>
+
+namespace {
+
+using Json = nlohmann::ordered_json;
+
+// What nlohmann-json writes inside the quotes, replacing ill-formed UTF-8.
+std::string referenceEscape(const std::string& text) {
+    const std::string quoted = Json(text).dump(-1, ' ', false, Json::error_handler_t::replace);
+    return quoted.substr(1, quoted.size() - 2);
+}
+
+std::string escaped(std::string_view text) {
+    std::string out;
+    appendJsonEscaped(out, text);
+    return out;
+}
+
+std::string escaped(std::u16string_view text) {
+    std::string out;
+    appendJsonEscaped(out, text);
+    return out;
+}
+
+struct Utf8Case {
+    const char* name;
+    std::string text;
+    const char* expected;
+};
+
+const Utf8Case kUtf8Cases[] = {
+    {"Plain", "order_1 + x", "order_1 + x"},
+    {"QuoteAndBackslash", "a\"b\\c/", "a\\\"b\\\\c/"},
+    {"ShortEscapes", "\b\t\n\f\r", "\\b\\t\\n\\f\\r"},
+    {"OtherControls", std::string("\0\x01\x1f\x0b", 4), "\\u0000\\u0001\\u001f\\u000b"},
+    {"DeleteStaysRaw", "\x7f", "\x7f"},
+    {"TwoThreeFourBytes", "\xc3\xa9\xe2\x82\xac\xf0\x9f\x98\x80",
+     "\xc3\xa9\xe2\x82\xac\xf0\x9f\x98\x80"},
+    {"HighestCodePoint", "\xf4\x8f\xbf\xbf", "\xf4\x8f\xbf\xbf"},
+    {"StrayContinuation", "a\x80z", "a\xef\xbf\xbdz"},
+    {"TwoStrayContinuations", "\x80\xbf", "\xef\xbf\xbd\xef\xbf\xbd"},
+    {"ByteThatLeadsNothing", "\xc0\xaf\xf5\xff",
+     "\xef\xbf\xbd\xef\xbf\xbd\xef\xbf\xbd\xef\xbf\xbd"},
+    {"OverlongThreeBytes", "\xe0\x80\xaf", "\xef\xbf\xbd\xef\xbf\xbd\xef\xbf\xbd"},
+    {"EncodedSurrogate", "\xed\xa0\x80", "\xef\xbf\xbd\xef\xbf\xbd\xef\xbf\xbd"},
+    {"BeyondUnicode", "\xf4\x90\x80\x80", "\xef\xbf\xbd\xef\xbf\xbd\xef\xbf\xbd\xef\xbf\xbd"},
+    {"CutShortThenAscii", "\xe2\x82z", "\xef\xbf\xbdz"},
+    {"CutShortThenQuote", "\xf0\x9f\x98\"", "\xef\xbf\xbd\\\""},
+    {"CutShortThenNewLead", "\xe2\xc3\xa9", "\xef\xbf\xbd\xc3\xa9"},
+    {"CutShortAtEnd", "ab\xf0\x9f\x98", "ab\xef\xbf\xbd"},
+};
+
+class Utf8Escaping : public ::testing::TestWithParam<Utf8Case> {};
+
+TEST_P(Utf8Escaping, MatchesTheDocumentLibrary) {
+    const Utf8Case& c = GetParam();
+    EXPECT_EQ(escaped(c.text), c.expected);
+    EXPECT_EQ(escaped(c.text), referenceEscape(c.text));
+}
+
+INSTANTIATE_TEST_SUITE_P(Text, Utf8Escaping, ::testing::ValuesIn(kUtf8Cases),
+                         [](const auto& param) { return std::string(param.param.name); });
+
+// Random bytes, weighted towards lead and continuation bytes so that well-formed and
+// ill-formed sequences of every length turn up.
+TEST(Utf8Escaping, RandomBytesMatchTheDocumentLibrary) {
+    std::mt19937 random(17);
+    const unsigned char kPool[] = {'a',  '"',  '\\', 0x00, 0x1f, 0x7f, 0x80, 0x8f, 0x90,
+                                   0x9f, 0xa0, 0xbf, 0xc0, 0xc2, 0xdf, 0xe0, 0xe1, 0xed,
+                                   0xef, 0xf0, 0xf1, 0xf4, 0xf5, 0xff, '\n'};
+    for (int round = 0; round < 20000; ++round) {
+        std::string text(random() % 12, '\0');
+        for (char& c : text)
+            c = static_cast<char>(kPool[random() % sizeof kPool]);
+        ASSERT_EQ(escaped(text), referenceEscape(text)) << ::testing::PrintToString(text);
+    }
+}
+
+// 16-bit text from the plug-in goes straight to the output: the same bytes as
+// converting it first (the host's conversion) and escaping the result.
+TEST(Utf16Escaping, MatchesConversionThenEscaping) {
+    const std::u16string cases[] = {
+        u"plain",
+        u"caf\u00e9 \u20ac",
+        u"\U0001F600 non-BMP",
+        std::u16string(1, u'\0') + u"\t\x1f\"\\",
+        std::u16string{0xD83D},                 // high surrogate at the end
+        std::u16string{0xDE00, u'a'},           // low surrogate alone
+        std::u16string{0xD83D, 0xD83D, 0xDE00}, // high, then a whole pair
+        std::u16string{0xD83D, u'x', 0xDE00},
+        std::u16string{0xFFFF, 0xFFFE},
+    };
+    for (const std::u16string& text : cases) {
+        const std::string viaHost = zrUtf16ToUtf8(text);
+        EXPECT_EQ(escaped(text), referenceEscape(viaHost)) << ::testing::PrintToString(viaHost);
+        std::string converted;
+        appendUtf8(converted, text);
+        EXPECT_EQ(converted, viaHost);
+    }
+
+    std::mt19937 random(29);
+    const char16_t kPool[] = {u'a',   u'"',   0x01,   0x7f,   0x80,   0x7ff,  0x800,
+                              0xD800, 0xDBFF, 0xDC00, 0xDFFF, 0xE000, 0xFFFD, 0xFFFF};
+    for (int round = 0; round < 5000; ++round) {
+        std::u16string text(random() % 8, u'\0');
+        for (char16_t& c : text)
+            c = kPool[random() % (sizeof kPool / sizeof kPool[0])];
+        ASSERT_EQ(escaped(text), referenceEscape(zrUtf16ToUtf8(text)));
+    }
+}
+
+} // namespace
