@@ -4,8 +4,10 @@
 #include "ParserConfig.h"
 #include "zrglob.h"
 
+#include <filesystem>
 #include <new>
 #include <string_view>
+#include <system_error>
 #include <xercesc/framework/MemBufInputSource.hpp>
 #include <xercesc/sax/SAXException.hpp>
 #include <xercesc/util/OutOfMemoryException.hpp>
@@ -128,8 +130,15 @@ void SchemaReader::logOutOfMemory() {
     }
 }
 
-void SchemaReader::parseDocument(xercesc::SAXParser& parser) {
+void SchemaReader::parseDocument(SchemaParser& parser) {
     try {
+        // The document's size sets what its entities may add; a file that cannot be
+        // measured gets the floor and fails when it is opened.
+        ZrString narrowPath;
+        narrowPath.Assign(documentPath_.c_str(), ZR_CSET_DEFAULT, -1);
+        std::error_code sizeError;
+        const auto size = std::filesystem::file_size(narrowPath.c_str(), sizeError);
+        parser.expectDocumentSize(sizeError ? 0 : static_cast<std::uint64_t>(size));
         FPInputSource source(documentPath_.c_str());
         parser.parse(source);
         if (source.readFailed())

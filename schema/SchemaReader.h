@@ -77,9 +77,7 @@ struct XmlQualifiedName {
     std::u16string_view local;  // null-terminated where the name is
 };
 
-XERCES_CPP_NAMESPACE_BEGIN
-class SAXParser;
-XERCES_CPP_NAMESPACE_END
+class SchemaParser;
 
 class SchemaReader : public xercesc::HandlerBase {
   public:
@@ -155,7 +153,7 @@ class SchemaReader : public xercesc::HandlerBase {
     // Appends a location to documentQueue unless the read has queued it already.
     bool queueDocument(const ZrWString& location);
     // Parses documentPath_; any failure, thrown or reported, sets `failed`.
-    void parseDocument(xercesc::SAXParser& parser);
+    void parseDocument(SchemaParser& parser);
     void logParseStopped(const XMLCh* message);
 
     SchemaModel& model;
