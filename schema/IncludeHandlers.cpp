@@ -1,25 +1,8 @@
 #include "SchemaReader.h"
 #include "zrglob.h"
 
-namespace {
-
-bool isSeparator(char c) { return c == '/' || c == '\\'; }
-
-// A location that names its own root: a leading separator, or a drive letter and
-// a colon.
-bool isAbsoluteLocation(const char* location) {
-    if (isSeparator(location[0]))
-        return true;
-    const bool letter =
-        (location[0] >= 'A' && location[0] <= 'Z') || (location[0] >= 'a' && location[0] <= 'z');
-    return letter && location[1] == ':';
-}
-
-} // namespace
-
-// Queues the included document; it is parsed after the current one. A relative
-// location is taken from the directory of the document that holds the include,
-// its own directory part kept.
+// Queues the included document; it is parsed after the current one. A location
+// that cannot be read fails the read.
 void SchemaReader::doInclude(xercesc::AttributeList& attrs) {
     for (XMLSize_t i = 0; i < attrs.getLength(); ++i) {
         ZrXmlUtils::XMLChToWchar(attrs.getName(i), nameBuffer, false);
@@ -27,18 +10,15 @@ void SchemaReader::doInclude(xercesc::AttributeList& attrs) {
             continue;
         ZrXmlUtils::XMLChToWchar(attrs.getValue(i), valueBuffer, false);
 
-        ZrWString location = valueBuffer;
-        const ZrURI includeURI(valueBuffer.c_str());
-        if (documentURI.protocol() == ZRP_NONE && includeURI.protocol() == ZRP_NONE &&
-            !isAbsoluteLocation(includeURI.path())) {
-            ZrString directory(documentURI.path());
-            ZrString name;
-            ZrString extension;
-            ZrGlob::sepfile(directory, name, extension);
-            if (!directory.empty()) {
-                ZrGlob::appndnam(directory, includeURI.path());
-                location.Assign(directory.c_str(), ZR_CSET_DEFAULT, -1);
-            }
+        ZrWString location;
+        ZrWString refusal;
+        if (!locateDocument(valueBuffer, location, refusal)) {
+            ZrGlob::LogMessage(
+                ZR_SEV_ERROR, 4,
+                lgettext(u"Schema: Error: Include of '%s' in file %s is not read: %s"),
+                valueBuffer.c_str(), documentPath_.c_str(), refusal.c_str());
+            failed = true;
+            continue;
         }
         queueDocument(location);
     }

@@ -77,6 +77,7 @@ struct XmlQualifiedName {
     std::u16string_view local;  // null-terminated where the name is
 };
 
+class SchemaCatalog;
 class SchemaParser;
 
 class SchemaReader : public xercesc::HandlerBase {
@@ -97,6 +98,10 @@ class SchemaReader : public xercesc::HandlerBase {
 
     // Logs that memory ran out while reading or building from the document read.
     void logOutOfMemory();
+
+    // The catalog through which the locations and namespaces that documents name
+    // are looked up; null for none. It must outlive the reads.
+    void setCatalog(const SchemaCatalog* catalog) { catalog_ = catalog; }
 
     // Whether the document being read has failed so far.
     bool hasFailed() const { return failed; }
@@ -149,6 +154,13 @@ class SchemaReader : public xercesc::HandlerBase {
     // than the reader keeps state for; the rest of the subtree is skipped.
     bool tooDeep();
 
+    // Where to read the document that the current document names by `location`
+    // (include, import, redefine): the catalog's mapping of the location as
+    // written, else the location itself, a relative one taken from the current
+    // document's directory. False, with `refusal` saying why, when that is not a
+    // local file: nothing is ever fetched over a network.
+    bool locateDocument(const ZrWString& location, ZrWString& path, ZrWString& refusal) const;
+
     // Parse driver steps.
     // Appends a location to documentQueue unless the read has queued it already.
     bool queueDocument(const ZrWString& location);
@@ -157,6 +169,7 @@ class SchemaReader : public xercesc::HandlerBase {
     void logParseStopped(const XMLCh* message);
 
     SchemaModel& model;
+    const SchemaCatalog* catalog_ = nullptr;
 
     // Parse driver state.
     bool failed = false;

@@ -409,10 +409,9 @@ const HostileCase kCases[] = {
      },
      19,
      "",
-     {{8, 4,
-       kFatal + "0, column 0 of file : unable to open primary document entity "
-                "'http://127.0.0.1:{port}/inc.xsd'",
-       true}}},
+     {{4, 4,
+       "Schema: Error: Include of 'http://127.0.0.1:{port}/inc.xsd' in file {dir}/main.xsd is "
+       "not read: it is not a local file, and no catalog maps it to one"}}},
     {"ImportOverNetwork",
      [](const TempDir& d) {
          return d.write("main.xsd", rootDoc("", "",
@@ -782,5 +781,72 @@ TEST_P(HostileInput, EndsWithRecordsOrALoggedReason) {
 
 INSTANTIATE_TEST_SUITE_P(Documents, HostileInput, ::testing::ValuesIn(kCases),
                          [](const auto& row) { return std::string(row.param.name); });
+
+// Network locations are read only where a catalog maps them to a local file; a
+// catalog that maps them elsewhere on the network fetches nothing either.
+TEST(NetworkLocations, ReadOnlyThroughACatalogThatMapsThemToLocalFiles) {
+    struct Row {
+        const char* name;
+        std::string include;
+        std::string catalogBody; // empty: no catalog
+        int status;
+        const char* records;
+        std::string message; // "{dir}" and "{port}" as in the table above
+    };
+
+    const std::string port = std::to_string(Listener::instance().port());
+    const Row rows[] = {
+        {"Rewritten", url("mapped/types.xsd"),
+         "<rewriteURI uriStartString=\"http://127.0.0.1:" + port +
+             "/mapped/\" rewritePrefix=\"local/\"/>",
+         0, "root: a/string/0\nincluded: b/int/10\n", ""},
+        {"BySystemEntry", url("sys.xsd"),
+         "<system systemId=\"" + url("sys.xsd") + "\" uri=\"local/types.xsd\"/>", 0,
+         "root: a/string/0\nincluded: b/int/10\n", ""},
+        {"MappedToTheNetwork", url("x.xsd"),
+         "<uri name=\"" + url("x.xsd") + "\" uri=\"" + url("elsewhere.xsd") + "\"/>", 19, "",
+         "Schema: Error: Include of 'http://127.0.0.1:{port}/x.xsd' in file {dir}/main.xsd is not "
+         "read: the catalog maps it to 'http://127.0.0.1:{port}/elsewhere.xsd', which is not a "
+         "local file"},
+        {"NotMapped", url("other.xsd"), "<uri name=\"urn:x\" uri=\"x.xsd\"/>", 19, "",
+         "Schema: Error: Include of 'http://127.0.0.1:{port}/other.xsd' in file {dir}/main.xsd is "
+         "not read: it is not a local file, and no catalog maps it to one"},
+        {"FileUri", "file://{dir}/local/types%2Exsd", "", 0,
+         "root: a/string/0\nincluded: b/int/10\n", ""},
+        {"MissingCatalog", "local/types.xsd", "-", 19, "",
+         "Schema: Error: Catalog file {dir}/none.xml is not read: it cannot be opened"},
+    };
+    for (const Row& row : rows) {
+        SCOPED_TRACE(row.name);
+        TempDir dir;
+        const std::string folder = dir.path().string();
+        dir.write("local/types.xsd",
+                  schemaDoc("<xs:element name=\"included\"><xs:complexType><xs:sequence>"
+                            "<xs:element name=\"b\" type=\"xs:int\"/></xs:sequence>"
+                            "</xs:complexType></xs:element>"));
+        const std::string path =
+            dir.write("main.xsd", rootDoc("", "",
+                                          "<xs:include schemaLocation=\"" +
+                                              expand(row.include, folder) + "\"/>"));
+        ZrXmlSchemaDict dict(nullptr);
+        if (row.catalogBody == "-")
+            dict.SetOption(u"SchemaCatalog", zrtest::wide(folder + "/none.xml").c_str());
+        else if (!row.catalogBody.empty())
+            dict.SetOption(
+                u"SchemaCatalog",
+                zrtest::wide(
+                    dir.write("catalog.xml", "<catalog xmlns=\"urn:oasis:names:tc:entity:xmlns:xml:"
+                                             "catalog\">" +
+                                                 row.catalogBody + "</catalog>"))
+                    .c_str());
+        Listener::instance().contacted();
+        zrtest::LogCapture log;
+        EXPECT_EQ(dict.ReadDictionary(path.c_str()), row.status);
+        EXPECT_EQ(dumpRecords(dict.RecordList()), row.records);
+        EXPECT_FALSE(Listener::instance().contacted()) << "the read opened a network connection";
+        EXPECT_EQ(log.lines(),
+                  row.message.empty() ? "" : "4 4 " + expand(row.message, folder) + "\n");
+    }
+}
 
 } // namespace
