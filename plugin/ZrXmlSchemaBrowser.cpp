@@ -1,6 +1,7 @@
 #include "ZrXmlSchemaBrowser.h"
 
 #include "RecordBuilder.h"
+#include "SchemaCatalog.h"
 #include "SchemaReader.h"
 #include "zrglob.h"
 
@@ -24,17 +25,29 @@ ZrXmlSchemaBrowser::ZrXmlSchemaBrowser() {
 ZrXmlSchemaBrowser::~ZrXmlSchemaBrowser() = default;
 
 bool ZrXmlSchemaBrowser::ReadSchema(const ZrWChar* path, bool qualified) {
+    SchemaReadOptions options;
+    options.qualifiedRecords = qualified;
+    return ReadSchema(path, options);
+}
+
+bool ZrXmlSchemaBrowser::ReadSchema(const ZrWChar* path, const SchemaReadOptions& options) {
     if (!initialised) {
         ZrGlob::LogMessage(ZR_SEV_ERROR, BE_READ_FAILED,
                            lgettext(u"SchemaBrowser: Initialization error: %s"), initError.c_str());
         return false;
     }
     records.Clear();
+    SchemaCatalog catalog;
     SchemaReader reader(model);
+    reader.setCatalog(&catalog);
     try {
+        if (!catalog.load(options.catalogs.view())) {
+            model.clear();
+            return false;
+        }
         if (!reader.read(path))
             return false;
-        RecordBuilder builder(model, builtins, records, qualified);
+        RecordBuilder builder(model, builtins, records, options.qualifiedRecords);
         return builder.build();
     } catch (const xercesc::OutOfMemoryException&) {
         reader.logOutOfMemory();

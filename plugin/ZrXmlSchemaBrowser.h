@@ -9,6 +9,14 @@
 #include "zrdtype.h"
 #include "zrstring.h"
 
+// What a read takes from the dictionary's options.
+struct SchemaReadOptions {
+    // "QualifiedRecordNames": nested records carry the names of those around them.
+    bool qualifiedRecords = false;
+    // "SchemaCatalog": catalog files separated by ";"; empty for none.
+    ZrWString catalogs;
+};
+
 class ZRBXMLS_API ZrXmlSchemaBrowser {
   public:
     ZrXmlSchemaBrowser();
@@ -17,8 +25,10 @@ class ZRBXMLS_API ZrXmlSchemaBrowser {
     ~ZrXmlSchemaBrowser();
 
     // Parses the schema at `path` and the documents it includes, then builds one
-    // record per top-level declaration of complex type. False when the read failed;
-    // the cause has been logged.
+    // record per top-level declaration of complex type. The catalogs of `options`
+    // are read first; one that cannot be read fails the read. False when the read
+    // failed; the cause has been logged.
+    bool ReadSchema(const ZrWChar* path, const SchemaReadOptions& options);
     bool ReadSchema(const ZrWChar* path, bool qualified);
 
     // Records of the latest read, in building order; they live as long as the browser.

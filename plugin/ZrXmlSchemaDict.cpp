@@ -25,7 +25,8 @@ ZrXmlSchemaDict::ZrXmlSchemaDict(ZrSpoke* spoke) : ZrDictBrowser(spoke, kBuiltin
 
 ZrXmlSchemaDict::ZrXmlSchemaDict(const ZrXmlSchemaDict& other)
     : ZrDictBrowser(other), initialised(other.initialised),
-      qualifiedRecords(other.qualifiedRecords), initError(other.initError) {}
+      qualifiedRecords(other.qualifiedRecords), initError(other.initError),
+      catalogFiles(other.catalogFiles) {}
 
 ZrXmlSchemaDict& ZrXmlSchemaDict::operator=(const ZrXmlSchemaDict& other) {
     if (this != &other) {
@@ -33,6 +34,7 @@ ZrXmlSchemaDict& ZrXmlSchemaDict::operator=(const ZrXmlSchemaDict& other) {
         initialised = other.initialised;
         qualifiedRecords = other.qualifiedRecords;
         initError = other.initError;
+        catalogFiles = other.catalogFiles;
     }
     return *this;
 }
@@ -54,7 +56,10 @@ BATCHERR ZrXmlSchemaDict::ReadDictionary(const char* path) {
     try {
         widePath.Assign(path, ZR_CSET_DEFAULT, -1);
         ZrXmlSchemaBrowser browser;
-        if (!browser.ReadSchema(widePath.c_str(), qualifiedRecords))
+        SchemaReadOptions options;
+        options.qualifiedRecords = qualifiedRecords;
+        options.catalogs = catalogFiles;
+        if (!browser.ReadSchema(widePath.c_str(), options))
             return BE_READ_FAILED;
         // The browser goes away with this scope: its records move rather than copy.
         browser.TakeRecords(RecordList());

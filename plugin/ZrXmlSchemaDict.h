@@ -9,7 +9,7 @@
 class ZrXmlSchemaDictTestAccess;
 
 class ZRBXMLS_API ZrXmlSchemaDict : public ZrDictBrowser {
-public:
+  public:
     explicit ZrXmlSchemaDict(ZrSpoke* spoke);
     ZrXmlSchemaDict(const ZrXmlSchemaDict& other);
     ZrXmlSchemaDict& operator=(const ZrXmlSchemaDict& other);
@@ -25,23 +25,32 @@ public:
     BATCHERR FlattenDictRecord(const ZrRecord* source, ZrRecord* target, ZrSpoke* spoke) override;
 
     bool QualifiedRecords() const { return qualifiedRecords; }
+
     void QualifiedRecords(bool on) { qualifiedRecords = on; }
 
-private:
+    // The option "SchemaCatalog": catalog files separated by ";", read before each
+    // read.
+    const ZrWString& CatalogFiles() const { return catalogFiles; }
+
+    void CatalogFiles(const ZrWString& files) { catalogFiles = files; }
+
+  private:
     friend class ZrXmlSchemaDictTestAccess;
 
     bool initialised = true;
     bool qualifiedRecords = false;
     ZrWString initError;
+    ZrWString catalogFiles;
 };
 
 // A complex number; exported for hosts, unused by the plug-in itself.
 class ZRBXMLS_API zrcomplex {
-public:
+  public:
     double re;
     double im;
 
     zrcomplex() : re(0.0), im(0.0) {}
+
     zrcomplex(double real, double imaginary) : re(real), im(imaginary) {}
 };
 

@@ -1,3 +1,4 @@
+#include "SchemaCatalog.h"
 #include "SchemaReader.h"
 #include "zrglob.h"
 
@@ -31,18 +32,26 @@ void SchemaReader::doImport(xercesc::AttributeList& attrs) {
             located = true;
         }
     }
+    // A location that no catalog entry maps is tried by the namespace.
+    ZrWString refusal;
+    if (located && locateDocument(valueBuffer, imported.path, refusal)) {
+        queueDocument(std::move(imported));
+        return;
+    }
+    if (catalog_) {
+        if (std::optional<std::u16string> mapped = catalog_->mapNamespace(imported.ns)) {
+            if (locateDocument(ZrWString(std::u16string_view(*mapped)), imported.path, refusal)) {
+                queueDocument(std::move(imported));
+                return;
+            }
+        }
+    }
     if (!located) {
         if (imported.ns != kXmlNamespace)
             noteImportFailure(imported.ns, u"", u"the import gives no location");
         return;
     }
-    if (ZrURI(valueBuffer.c_str()).protocol() != ZRP_NONE) {
-        noteImportFailure(imported.ns, valueBuffer.view(),
-                          u"a location with a protocol is never fetched");
-        return;
-    }
-    imported.path = locationFromDocument(valueBuffer);
-    queueDocument(std::move(imported));
+    noteImportFailure(imported.ns, valueBuffer.view(), refusal.view());
 }
 
 // Reads the redefined document like an included one; the definitions inside
@@ -57,7 +66,15 @@ void SchemaReader::doRedefine(xercesc::AttributeList& attrs) {
             continue;
         ZrXmlUtils::XMLChToWchar(attrs.getValue(i), valueBuffer, false);
         QueuedDocument redefined;
-        redefined.path = locationFromDocument(valueBuffer);
+        ZrWString refusal;
+        if (!locateDocument(valueBuffer, redefined.path, refusal)) {
+            ZrWString text;
+            wsfmt(text, lgettext(u"Schema: Error: Redefine of '%s' in file %s is not read: %s"),
+                  valueBuffer.c_str(), documentPath_.c_str(), refusal.c_str());
+            reportError(ZR_SEV_ERROR, 4, text);
+            failed = true;
+            continue;
+        }
         redefined.imported = currentDocument.imported;
         redefined.ns = currentDocument.ns;
         redefined.target = bindings->targetNamespace;

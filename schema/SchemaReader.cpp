@@ -4,8 +4,10 @@
 #include "ParserConfig.h"
 #include "zrglob.h"
 
+#include <filesystem>
 #include <new>
 #include <string_view>
+#include <system_error>
 #include <xercesc/framework/MemBufInputSource.hpp>
 #include <xercesc/sax/SAXException.hpp>
 #include <xercesc/util/OutOfMemoryException.hpp>
@@ -138,7 +140,7 @@ bool SchemaReader::read(const ZrWChar* path) {
     return true;
 }
 
-bool SchemaReader::readQueue(xercesc::SAXParser& parser, std::deque<QueuedDocument>& queue) {
+bool SchemaReader::readQueue(SchemaParser& parser, std::deque<QueuedDocument>& queue) {
     while (!queue.empty()) {
         startDocument(queue.front());
         queue.pop_front();
@@ -233,15 +235,23 @@ void SchemaReader::logOutOfMemory() {
     }
 }
 
-void SchemaReader::parseDocument(xercesc::SAXParser& parser) {
+void SchemaReader::parseDocument(SchemaParser& parser) {
     try {
         if (!currentDocument.text.empty()) {
+            parser.expectDocumentSize(currentDocument.text.size());
             const xercesc::MemBufInputSource source(
                 reinterpret_cast<const XMLByte*>(currentDocument.text.data()),
                 currentDocument.text.size(), documentPath_.c_str(), false);
             parser.parse(source);
             return;
         }
+        // The document's size sets what its entities may add; a file that cannot be
+        // measured gets the floor and fails when it is opened.
+        ZrString narrowPath;
+        narrowPath.Assign(documentPath_.c_str(), ZR_CSET_DEFAULT, -1);
+        std::error_code sizeError;
+        const auto size = std::filesystem::file_size(narrowPath.c_str(), sizeError);
+        parser.expectDocumentSize(sizeError ? 0 : static_cast<std::uint64_t>(size));
         FPInputSource source(documentPath_.c_str());
         parser.parse(source);
         if (source.readFailed())

@@ -77,9 +77,8 @@ struct XmlQualifiedName {
     std::u16string_view local;  // null-terminated where the name is
 };
 
-XERCES_CPP_NAMESPACE_BEGIN
-class SAXParser;
-XERCES_CPP_NAMESPACE_END
+class SchemaCatalog;
+class SchemaParser;
 
 class SchemaReader : public xercesc::HandlerBase {
   public:
@@ -99,6 +98,10 @@ class SchemaReader : public xercesc::HandlerBase {
 
     // Logs that memory ran out while reading or building from the document read.
     void logOutOfMemory();
+
+    // The catalog through which the locations and namespaces that documents name
+    // are looked up; null for none. It must outlive the reads.
+    void setCatalog(const SchemaCatalog* catalog) { catalog_ = catalog; }
 
     // Whether the document being read has failed so far.
     bool hasFailed() const { return failed; }
@@ -143,9 +146,6 @@ class SchemaReader : public xercesc::HandlerBase {
     void doImport(xercesc::AttributeList& attrs);
     void doRedefine(xercesc::AttributeList& attrs);
     void finishRedefine();
-    // The path of a document named by `written` in the document being read: a
-    // relative location is taken from that document's folder.
-    ZrWString locationFromDocument(const ZrWString& written) const;
     // Inside a redefinition, a reference to the component being redefined means the
     // original: its name becomes the one the original is read under.
     void referToOriginal(ZrName& name, const ZrName& ns, bool isGroup) const;
@@ -168,6 +168,13 @@ class SchemaReader : public xercesc::HandlerBase {
     // than the reader keeps state for; the rest of the subtree is skipped.
     bool tooDeep();
 
+    // Where to read the document that the current document names by `location`
+    // (include, import, redefine): the catalog's mapping of the location as
+    // written, else the location itself, a relative one taken from the current
+    // document's directory. False, with `refusal` saying why, when that is not a
+    // local file: nothing is ever fetched over a network.
+    bool locateDocument(const ZrWString& location, ZrWString& path, ZrWString& refusal) const;
+
     // A type (isGroup false) or group definition that a redefinition replaces.
     struct RedefinedName {
         TypeRef ref;
@@ -179,10 +186,10 @@ class SchemaReader : public xercesc::HandlerBase {
     // Appends a document to its queue unless the read has queued it already.
     bool queueDocument(QueuedDocument document);
     // Parses the current document; any failure, thrown or reported, sets `failed`.
-    void parseDocument(xercesc::SAXParser& parser);
+    void parseDocument(SchemaParser& parser);
     // Reads the queued documents of one queue; false when a document of the main
     // schema failed.
-    bool readQueue(xercesc::SAXParser& parser, std::deque<QueuedDocument>& queue);
+    bool readQueue(SchemaParser& parser, std::deque<QueuedDocument>& queue);
     void startDocument(const QueuedDocument& document);
     // An imported document that failed: noted in the model, its partial state dropped.
     void noteFailedImport(const ZrWString& reason);
@@ -196,6 +203,7 @@ class SchemaReader : public xercesc::HandlerBase {
     void reportError(int severity, int code, const ZrWString& text);
 
     SchemaModel& model;
+    const SchemaCatalog* catalog_ = nullptr;
 
     // Parse driver state.
     bool failed = false;

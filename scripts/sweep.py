@@ -2,9 +2,12 @@
 """Reads every .xsd under a folder with `zrdict read --format json`, each file as the
 main document, under a time and a memory limit per read, and prints a summary.
 
-    scripts/sweep.py FOLDER [TIMEOUT_S] [MEM_MB]
+    scripts/sweep.py FOLDER [TIMEOUT_S] [MEM_MB] [-- ZRDICT_ARG...]
 
 TIMEOUT_S defaults to 30 and MEM_MB (address-space limit of each read) to 1024.
+Arguments after "--" go to every `zrdict read` before the document, for example
+`-- --option SchemaCatalog=corpus/musicxml-4.0/catalog.xml` to sweep a set with its
+catalog (relative paths are taken from the folder the sweep runs in).
 Environment: ZRDICT names the zrdict program (default: the one in build/example or
 build/werror, the trees of run-example.sh and run-tests.sh), JOBS the
 number of reads run at once (default 2), SWEEP_RESULTS a file that receives one
@@ -63,6 +66,17 @@ KNOWN_FORMATS = [
                 re.S), "Schema: Error: Declarations and types nested deeper than %d in file %s"),
     (re.compile(r"^Schema: Out of memory reading file .*$", re.S),
      "Schema: Out of memory reading file %s"),
+    (re.compile(r"^Schema: Error: Include of '.*' in file .* is not read: it is not a local file.*$",
+                re.S), "Schema: Error: Include of '%s' in file %s is not read: not a local file"),
+    (re.compile(r"^Schema: Error: Include of '.*' in file .* is not read: the catalog maps it.*$",
+                re.S), "Schema: Error: Include of '%s' in file %s is not read: the catalog maps "
+                       "it to a network location"),
+    (re.compile(r"^Schema: Error: Catalog file .* is not read: .*$", re.S),
+     "Schema: Error: Catalog file %s is not read: %s"),
+    (re.compile(r"^Schema: Error: Reading file .* stopped: entity references expand the "
+                r"document beyond .*$", re.S),
+     "Schema: Error: Reading file %s stopped: entity references expand the document beyond %d "
+     "characters"),
 ]
 PARSER_MESSAGE = re.compile(
     r"^(Schema: (?:Warning|Error|Fatal): )At line -?\d+, column -?\d+ of file (.*?): (.*)$", re.S)
@@ -102,14 +116,14 @@ def sampled_peak_kb(pid):
     return 0
 
 
-def run_one(zrdict, path, timeout_s, mem_mb, scratch):
+def run_one(zrdict, extra_args, path, timeout_s, mem_mb, scratch):
     """Reads one document; returns (outcome, status, seconds, peak_kb, reason)."""
     out_path = os.path.join(scratch, "out-%d" % threading.get_ident())
     limit = mem_mb * 1024 * 1024
     # prlimit applies the limits to the read itself (it execs zrdict), and posix_spawn
     # runs no Python code in the child, which matters with reader threads around.
-    argv = [PRLIMIT, "--as=%d" % limit, "--core=0", "--", zrdict, "read", "--format", "json",
-            path]
+    argv = ([PRLIMIT, "--as=%d" % limit, "--core=0", "--", zrdict, "read", "--format", "json"] +
+            extra_args + [path])
     start = time.monotonic()
     with open(out_path + ".json", "wb") as out, open(out_path + ".err", "wb") as err:
         pid = os.posix_spawn(PRLIMIT, argv, os.environ,
@@ -166,6 +180,10 @@ def run_one(zrdict, path, timeout_s, mem_mb, scratch):
 
 
 def main(argv):
+    extra_args = []
+    if "--" in argv:
+        at = argv.index("--")
+        argv, extra_args = argv[:at], argv[at + 1:]
     if len(argv) < 2 or len(argv) > 4:
         sys.stderr.write(__doc__)
         return 2
@@ -192,8 +210,8 @@ def main(argv):
     results = []
     with tempfile.TemporaryDirectory(prefix="zrsweep-") as scratch:
         with concurrent.futures.ThreadPoolExecutor(max_workers=jobs) as pool:
-            futures = {pool.submit(run_one, zrdict, os.path.abspath(f), timeout_s, mem_mb,
-                                   scratch): f for f in files}
+            futures = {pool.submit(run_one, zrdict, extra_args, os.path.abspath(f), timeout_s,
+                                   mem_mb, scratch): f for f in files}
             for n, future in enumerate(concurrent.futures.as_completed(futures), 1):
                 results.append((futures[future],) + future.result())
                 if sys.stderr.isatty() and n % 50 == 0:
@@ -214,6 +232,8 @@ def main(argv):
     counts = collections.Counter(r[1] for r in results)
     print("Sweep of %s: %d documents, limits %gs and %d MB per read, %d at a time, %.0fs"
           % (folder, len(results), timeout_s, mem_mb, jobs, elapsed))
+    if extra_args:
+        print("zrdict arguments: %s" % " ".join(extra_args))
     print()
     print("| outcome | documents |")
     print("|---|---:|")

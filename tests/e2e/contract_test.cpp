@@ -272,13 +272,15 @@ TEST(Read, TextOutputSendsMessagesToStderrWithSeverityAndCode) {
     EXPECT_TRUE(contains(run.err, "zrdict: reading ")) << run.err;
 }
 
-TEST(Options, JsonListsTheOptionWithItsValue) {
-    RunResult run = runZrdict({"options", "--format", "json"});
+TEST(Options, JsonListsTheOptionsWithTheirValues) {
+    RunResult run = runZrdict({"options", "--format", "json", "--option", "SchemaCatalog=a.xml"});
     ASSERT_EQ(run.exitStatus, 0) << run.err;
     EXPECT_EQ(run.err, "");
     Json expected = Json::parse(R"({"options": [{"key": "qualifiedrecordnames",
         "name": "QualifiedRecordNames", "description": "Strip leading blanks",
-        "default": "False", "value": "False"}], "messages": []})");
+        "default": "False", "value": "False"}, {"key": "schemacatalog",
+        "name": "SchemaCatalog", "description": "OASIS XML catalog files, separated by \";\", through which the locations and namespaces that schemas import or include are mapped to local files",
+        "default": "", "value": "a.xml"}], "messages": []})");
     EXPECT_EQ(run.json(), expected);
 }
 

@@ -111,6 +111,39 @@ std::string parameterLaughs() {
     return dtd + "%pe9;\n]>";
 }
 
+// Entities that build a pattern for IPv6 addresses bottom-up from small parts, the
+// way type libraries write grammars: some two thousand expansions in all, a few
+// dozen kilobytes of text.
+std::string grammarEntities() {
+    return "<!DOCTYPE xs:schema [\n"
+           "<!ENTITY d \"[0-9]\">\n"
+           "<!ENTITY d \"[0-7]\">\n" // a second declaration of a name is ignored
+           "<!ENTITY h \"(&d;|[A-Fa-f])\">\n"
+           "<!ENTITY h16 \"(&h;){1,4}\">\n"
+           "<!ENTITY octet \"(&d;|[1-9]&d;|1&d;&d;|2[0-4]&d;|25[0-5])\">\n"
+           "<!ENTITY v4 \"&octet;\\.&octet;\\.&octet;\\.&octet;\">\n"
+           "<!ENTITY ls32 \"(&h16;:&h16;|&v4;)\">\n"
+           "<!ENTITY v6 \"((&h16;:){6}&ls32;|::(&h16;:){5}&ls32;|(&h16;)?::(&h16;:){4}&ls32;|"
+           "((&h16;:)?&h16;)?::(&h16;:){3}&ls32;|((&h16;:){0,2}&h16;)?::(&h16;:){2}&ls32;|"
+           "((&h16;:){0,3}&h16;)?::&h16;:&ls32;|((&h16;:){0,4}&h16;)?::&ls32;|"
+           "((&h16;:){0,5}&h16;)?::&h16;|((&h16;:){0,6}&h16;)?::)\">\n"
+           "<!ENTITY empty \"\">\n"
+           "<!ENTITY host \"(\\[&v6;\\]|&v4;|[a-z0-9.\\-]+)&empty;\">\n"
+           "]>";
+}
+
+// Entities that each name the one before `fanOut` times, `levels` deep, the first
+// expanding to `leaf`.
+std::string nestedEntities(int levels, int fanOut, const std::string& leaf) {
+    std::string dtd = "<!DOCTYPE xs:schema [\n<!ENTITY n0 \"" + leaf + "\">\n";
+    for (int i = 1; i <= levels; ++i)
+        dtd += "<!ENTITY n" + std::to_string(i) + " \"" +
+               repeat("&n" + std::to_string(i - 1) + ";", fanOut) + "\">\n";
+    return dtd + "]>";
+}
+
+const std::string kOverBudget = "entity references expand the document beyond 4194304 characters";
+
 // A simple type "P" restricting string with `pattern`, and a field f of that type.
 std::string patternDoc(const std::string& pattern) {
     return rootDoc(
@@ -188,20 +221,18 @@ const HostileCase kCases[] = {
      },
      19,
      "",
-     {{8, 4,
-       "Schema: Fatal: At line 16, column 93 of file {dir}/main.xsd: parser has encountered "
-       "more than '1000' entity expansions",
-       true}}},
+     {{4, 4,
+       "Schema: Error: Reading file {dir}/main.xsd stopped: entity references expand the "
+       "document beyond 4194304 characters (at line 16, column 93)"}}},
     {"BillionLaughsInContent",
      [](const TempDir& d) {
          return d.write("main.xsd", rootDoc("<xs:annotation>&lol9;</xs:annotation>", laughs()));
      },
      19,
      "",
-     {{8, 4,
-       "Schema: Fatal: At line 16, column 61 of file {dir}/main.xsd: parser has encountered "
-       "more than '1000' entity expansions",
-       true}}},
+     {{4, 4,
+       "Schema: Error: Reading file {dir}/main.xsd stopped: entity references expand the "
+       "document beyond 4194304 characters (at line 16, column 61)"}}},
     {"ParameterEntityLaughs",
      [](const TempDir& d) { return d.write("main.xsd", rootDoc("", parameterLaughs())); },
      19,
@@ -241,6 +272,72 @@ const HostileCase kCases[] = {
      0,
      "root: a/string/0 fromEntity/int/10\n",
      {}},
+
+    {"GrammarBuiltFromEntities",
+     [](const TempDir& d) {
+         std::string fields;
+         std::string types;
+         int count = 0;
+         for (const char* pattern : {"&v6;", "&host;", "&host;(:&d;+)?", "&v4;|&v6;"}) {
+             const std::string n = std::to_string(count++);
+             fields += "<xs:element name=\"f" + n + "\" type=\"P" + n + "\"/>";
+             types += "<xs:simpleType name=\"P" + n +
+                      "\"><xs:restriction base=\"xs:string\"><xs:pattern value=\"" + pattern +
+                      "\"/></xs:restriction></xs:simpleType>";
+         }
+         return d.write("main.xsd", rootDoc(fields, grammarEntities(), types));
+     },
+     0,
+     "root: a/string/0 f0/string/45 f1/string/0 f2/string/0 f3/string/45\n",
+     {}},
+    // A hundred thousand expansions in one attribute value, producing little.
+    {"NestedEntitiesInAttribute",
+     [](const TempDir& d) {
+         return d.write("main.xsd", rootDoc("<xs:element name=\"b\" type=\"xs:string\" "
+                                            "default=\"" +
+                                                repeat("&n5;", 13) + "\"/>",
+                                            nestedEntities(5, 10, "lol")));
+     },
+     19,
+     "",
+     {{4, 4, "Schema: Error: Reading file {dir}/main.xsd stopped: " + kOverBudget, true}}},
+    // Expansions that produce nothing still cost.
+    {"EmptyEntitiesInContent",
+     [](const TempDir& d) {
+         return d.write("main.xsd",
+                        rootDoc("<xs:annotation>&n9;</xs:annotation>", nestedEntities(9, 10, "")));
+     },
+     19,
+     "",
+     {{4, 4, "Schema: Error: Reading file {dir}/main.xsd stopped: " + kOverBudget, true}}},
+    {"EmptyEntitiesInAttributes",
+     [](const TempDir& d) {
+         return d.write("main.xsd", rootDoc(repeat("<xs:annotation id=\"&n3;\"/>", 10000),
+                                            nestedEntities(3, 10, "")));
+     },
+     19,
+     "",
+     {{4, 4, "Schema: Error: Reading file {dir}/main.xsd stopped: " + kOverBudget, true}}},
+    // A long entity named from many start tags, and from much content.
+    {"LongEntityInManyAttributes",
+     [](const TempDir& d) {
+         return d.write("main.xsd", rootDoc(repeat("<xs:annotation id=\"&big;\"/>", 2000),
+                                            "<!DOCTYPE xs:schema [<!ENTITY big \"" +
+                                                std::string(4000, 'x') + "\">]>"));
+     },
+     19,
+     "",
+     {{4, 4, "Schema: Error: Reading file {dir}/main.xsd stopped: " + kOverBudget, true}}},
+    {"LongEntityInMuchContent",
+     [](const TempDir& d) {
+         return d.write(
+             "main.xsd",
+             rootDoc("<xs:annotation>" + repeat("&big;", 2000) + "</xs:annotation>",
+                     "<!DOCTYPE xs:schema [<!ENTITY big \"" + std::string(4000, 'x') + "\">]>"));
+     },
+     19,
+     "",
+     {{4, 4, "Schema: Error: Reading file {dir}/main.xsd stopped: " + kOverBudget, true}}},
 
     // Nothing outside the schema documents is read or fetched.
     {"ExternalEntityLocalFile",
@@ -312,10 +409,9 @@ const HostileCase kCases[] = {
      },
      19,
      "",
-     {{8, 4,
-       kFatal + "0, column 0 of file : unable to open primary document entity "
-                "'http://127.0.0.1:{port}/inc.xsd'",
-       true}}},
+     {{4, 4,
+       "Schema: Error: Include of 'http://127.0.0.1:{port}/inc.xsd' in file {dir}/main.xsd is "
+       "not read: it is not a local file, and no catalog maps it to one"}}},
     {"ImportOverNetwork",
      [](const TempDir& d) {
          return d.write("main.xsd", rootDoc("", "",
@@ -685,5 +781,72 @@ TEST_P(HostileInput, EndsWithRecordsOrALoggedReason) {
 
 INSTANTIATE_TEST_SUITE_P(Documents, HostileInput, ::testing::ValuesIn(kCases),
                          [](const auto& row) { return std::string(row.param.name); });
+
+// Network locations are read only where a catalog maps them to a local file; a
+// catalog that maps them elsewhere on the network fetches nothing either.
+TEST(NetworkLocations, ReadOnlyThroughACatalogThatMapsThemToLocalFiles) {
+    struct Row {
+        const char* name;
+        std::string include;
+        std::string catalogBody; // empty: no catalog
+        int status;
+        const char* records;
+        std::string message; // "{dir}" and "{port}" as in the table above
+    };
+
+    const std::string port = std::to_string(Listener::instance().port());
+    const Row rows[] = {
+        {"Rewritten", url("mapped/types.xsd"),
+         "<rewriteURI uriStartString=\"http://127.0.0.1:" + port +
+             "/mapped/\" rewritePrefix=\"local/\"/>",
+         0, "root: a/string/0\nincluded: b/int/10\n", ""},
+        {"BySystemEntry", url("sys.xsd"),
+         "<system systemId=\"" + url("sys.xsd") + "\" uri=\"local/types.xsd\"/>", 0,
+         "root: a/string/0\nincluded: b/int/10\n", ""},
+        {"MappedToTheNetwork", url("x.xsd"),
+         "<uri name=\"" + url("x.xsd") + "\" uri=\"" + url("elsewhere.xsd") + "\"/>", 19, "",
+         "Schema: Error: Include of 'http://127.0.0.1:{port}/x.xsd' in file {dir}/main.xsd is not "
+         "read: the catalog maps it to 'http://127.0.0.1:{port}/elsewhere.xsd', which is not a "
+         "local file"},
+        {"NotMapped", url("other.xsd"), "<uri name=\"urn:x\" uri=\"x.xsd\"/>", 19, "",
+         "Schema: Error: Include of 'http://127.0.0.1:{port}/other.xsd' in file {dir}/main.xsd is "
+         "not read: it is not a local file, and no catalog maps it to one"},
+        {"FileUri", "file://{dir}/local/types%2Exsd", "", 0,
+         "root: a/string/0\nincluded: b/int/10\n", ""},
+        {"MissingCatalog", "local/types.xsd", "-", 19, "",
+         "Schema: Error: Catalog file {dir}/none.xml is not read: it cannot be opened"},
+    };
+    for (const Row& row : rows) {
+        SCOPED_TRACE(row.name);
+        TempDir dir;
+        const std::string folder = dir.path().string();
+        dir.write("local/types.xsd",
+                  schemaDoc("<xs:element name=\"included\"><xs:complexType><xs:sequence>"
+                            "<xs:element name=\"b\" type=\"xs:int\"/></xs:sequence>"
+                            "</xs:complexType></xs:element>"));
+        const std::string path =
+            dir.write("main.xsd", rootDoc("", "",
+                                          "<xs:include schemaLocation=\"" +
+                                              expand(row.include, folder) + "\"/>"));
+        ZrXmlSchemaDict dict(nullptr);
+        if (row.catalogBody == "-")
+            dict.SetOption(u"SchemaCatalog", zrtest::wide(folder + "/none.xml").c_str());
+        else if (!row.catalogBody.empty())
+            dict.SetOption(
+                u"SchemaCatalog",
+                zrtest::wide(
+                    dir.write("catalog.xml", "<catalog xmlns=\"urn:oasis:names:tc:entity:xmlns:xml:"
+                                             "catalog\">" +
+                                                 row.catalogBody + "</catalog>"))
+                    .c_str());
+        Listener::instance().contacted();
+        zrtest::LogCapture log;
+        EXPECT_EQ(dict.ReadDictionary(path.c_str()), row.status);
+        EXPECT_EQ(dumpRecords(dict.RecordList()), row.records);
+        EXPECT_FALSE(Listener::instance().contacted()) << "the read opened a network connection";
+        EXPECT_EQ(log.lines(),
+                  row.message.empty() ? "" : "4 4 " + expand(row.message, folder) + "\n");
+    }
+}
 
 } // namespace

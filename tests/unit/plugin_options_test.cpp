@@ -1,4 +1,5 @@
-// The plug-in's option "QualifiedRecordNames" through the host's option machinery.
+// The plug-in's options, "QualifiedRecordNames" and "SchemaCatalog", through the
+// host's option machinery.
 #include "ZrXmlSchemaDict.h"
 
 #include <gtest/gtest.h>
@@ -12,15 +13,24 @@ std::string optionText(const ZrDictBrowser& dict, const char16_t* name) {
     return zrUtf16ToUtf8(value.view());
 }
 
-// One definition, shared by every dictionary, served by narrow callbacks; the
-// option starts from its default.
-TEST(PluginOptions, OneSharedDefinitionStartingFalse) {
+// Two definitions in a fixed order, shared by every dictionary; the boolean one is
+// served by narrow callbacks, the file list by wide ones. Both start from their
+// defaults.
+TEST(PluginOptions, SharedDefinitionsStartingFromTheirDefaults) {
     ZrXmlSchemaDict dict(nullptr);
-    EXPECT_EQ(dict.OptionDefCount(), 1);
+    EXPECT_EQ(dict.OptionDefCount(), 2);
     const ZrOptionDef** defs = dict.GetOptionDefs();
     ASSERT_NE(defs, nullptr);
     ASSERT_NE(defs[0], nullptr);
-    EXPECT_EQ(defs[1], nullptr);
+    ASSERT_NE(defs[1], nullptr);
+    EXPECT_EQ(defs[2], nullptr);
+    EXPECT_EQ(defs[1]->Key().str(), u"schemacatalog");
+    EXPECT_EQ(defs[1]->Name().str(), u"SchemaCatalog");
+    EXPECT_STREQ(defs[1]->DefaultValue().c_str(), "");
+    EXPECT_NE(defs[1]->WGetter(), nullptr);
+    EXPECT_NE(defs[1]->WSetter(), nullptr);
+    EXPECT_EQ(dict.CatalogFiles().str(), u"");
+    EXPECT_EQ(optionText(dict, u"SchemaCatalog"), "");
     EXPECT_EQ(defs[0]->Key().str(), u"qualifiedrecordnames");
     EXPECT_STREQ(defs[0]->DefaultValue().c_str(), "False");
     EXPECT_NE(defs[0]->Getter(), nullptr);
@@ -79,6 +89,36 @@ TEST(PluginOptions, SetterReportsChanges) {
     }
 }
 
+// The file list is kept as given, whatever it holds; the next read reads it.
+TEST(PluginOptions, CatalogListIsKeptAsGiven) {
+    ZrXmlSchemaDict dict(nullptr);
+    const ZrOptionWSetter set = dict.GetOptionDefs()[1]->WSetter();
+    void* owner = static_cast<ZrDictBrowser*>(&dict);
+
+    struct Step {
+        const char16_t* value;
+        bool changed;
+    };
+
+    const Step steps[] = {{u"", false},
+                          {u"a.xml; d\u00E9j\u00E0/b.xml", true},
+                          {u"a.xml; d\u00E9j\u00E0/b.xml", false},
+                          {u"  ;  ", true},
+                          {u"", true}};
+    for (const auto& step : steps) {
+        bool changed = !step.changed;
+        EXPECT_EQ(set(owner, step.value, changed, nullptr), BE_OK);
+        EXPECT_EQ(changed, step.changed) << zrUtf16ToUtf8(step.value);
+        EXPECT_EQ(dict.CatalogFiles().str(), step.value);
+        EXPECT_EQ(optionText(dict, u"schemacatalog"), zrUtf16ToUtf8(step.value));
+    }
+    EXPECT_EQ(dict.SetOption(u"SCHEMACATALOG", u"c.xml"), BE_OK);
+    EXPECT_EQ(ZrXmlSchemaDict(dict).CatalogFiles().str(), u"c.xml");
+    ZrXmlSchemaDict assigned(nullptr);
+    assigned = dict;
+    EXPECT_EQ(assigned.CatalogFiles().str(), u"c.xml");
+}
+
 TEST(PluginOptions, UnknownNamesAndLoadedOptions) {
     ZrXmlSchemaDict dict(nullptr);
     ZrWString value;
@@ -86,9 +126,10 @@ TEST(PluginOptions, UnknownNamesAndLoadedOptions) {
     EXPECT_EQ(dict.GetOption(u"QualifiedRecordNames ", value), BE_UNKNOWN_OPTION);
     EXPECT_FALSE(dict.QualifiedRecords());
 
-    ZrString saved("# saved options\nQualifiedRecordNames=True\n");
+    ZrString saved("# saved options\nQualifiedRecordNames=True\nSchemaCatalog = x.xml;y.xml \n");
     dict.LoadOptions(saved);
     EXPECT_TRUE(dict.QualifiedRecords());
+    EXPECT_EQ(dict.CatalogFiles().str(), u"x.xml;y.xml");
 }
 
 } // namespace

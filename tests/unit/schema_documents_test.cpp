@@ -99,8 +99,8 @@ const DocumentsCase kCases[] = {
                  <xs:element ref="h:e"/></xs:sequence></xs:complexType></xs:element>)")}},
      "r(0):\n",
      "4 0 Failed to look up ref to urn:h:e\n"
-     "4 4 Import of namespace 'urn:h' from 'http://127.0.0.1:9/h.xsd' was not read: a location "
-     "with a protocol is never fetched\n",
+     "4 4 Import of namespace 'urn:h' from 'http://127.0.0.1:9/h.xsd' was not read: it is not a "
+     "local file, and no catalog maps it to one\n",
      false},
     {"ImportedDocumentThatIsNoSchema",
      {{"main.xsd", doc(kMainA, R"(<xs:import namespace="urn:b" schemaLocation="b.xsd"/>
