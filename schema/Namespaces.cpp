@@ -43,7 +43,7 @@ void SchemaReader::parseName(const XMLCh* name, bool useDefault, ZrName& localPa
         useDefault ? &bindings->defaultNamespace : &bindings->targetNamespace;
     if (text.prefixed())
         uri = namespaceOfPrefix(text.prefix);
-    if (uri == &xmlNamespace())
+    if (uri && *uri == kXmlNamespace)
         usesXmlNamespace = true;
     // Both results are taken before either output changes, since the name may be
     // the text of one of them. An unknown prefix leaves no namespace: the empty text.

@@ -160,6 +160,15 @@ const DocumentsCase kCases[] = {
      "  xml:lang: language attribute(292) 0/0/0 null\n"
      "  xml:space: NCName attribute(299) 8/0/0 null\n"
      "  xml:id: ID attribute(288) 0/0/0 null\n"},
+    // An import of the XML namespace that cannot be read leaves the built-in one.
+    {"XmlNamespaceDeclaredAndImportedFromTheNetwork",
+     {{"main.xsd", doc(kMainA + R"( xmlns:xml="http://www.w3.org/XML/1998/namespace")",
+                       R"(<xs:import namespace="http://www.w3.org/XML/1998/namespace"
+                         schemaLocation="http://www.w3.org/2001/xml.xsd"/>
+               <xs:element name="r"><xs:complexType><xs:attribute ref="xml:space"/>
+               </xs:complexType></xs:element>)")}},
+     "r(0):\n"
+     "  xml:space: NCName attribute(299) 8/0/0 null\n"},
     {"ImportedXmlNamespaceDocumentWins",
      {{"main.xsd", doc(kMainA, R"(<xs:import namespace="http://www.w3.org/XML/1998/namespace"
                                 schemaLocation="xml.xsd"/>
