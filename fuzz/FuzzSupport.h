@@ -130,10 +130,12 @@ class LogKeeper {
 // Reads the schema at `path` the way a host does and checks what a read promises
 // whatever its input: records and status 0 without a logged error, or no records,
 // status 19 and a logged error that says why.
-inline void readAndCheck(const std::string& path, bool qualifiedRecords) {
+inline void readAndCheck(const std::string& path, bool qualifiedRecords,
+                         const std::string& catalogs = "") {
     LogKeeper log;
     ZrXmlSchemaDict dict(nullptr);
     dict.QualifiedRecords(qualifiedRecords);
+    dict.CatalogFiles(ZrWString(zrUtf8ToUtf16(catalogs)));
     const BATCHERR status = dict.ReadDictionary(path.c_str());
 
     ZRFUZZ_CHECK(status == BE_OK || status == BE_READ_FAILED);
