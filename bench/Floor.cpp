@@ -64,7 +64,9 @@ void FloorHandler::startElement(const XMLCh* name, AttributeList& attrs) {
     for (const XMLCh* p = name; *p; ++p)
         if (*p == u':')
             local = p + 1;
-    if (!XMLString::equals(local, u"include"))
+    // The documents a read follows: included, redefined and imported ones.
+    if (!XMLString::equals(local, u"include") && !XMLString::equals(local, u"import") &&
+        !XMLString::equals(local, u"redefine"))
         return;
     if (const XMLCh* location = attrs.getValue(u"schemaLocation"))
         includes.push_back(utf8(location));
@@ -93,6 +95,10 @@ std::vector<std::string> runFloor(const std::string& mainPath, FloorHandler& han
             throw std::runtime_error("floor parse failed: " + handler.firstError);
         parsed.push_back(path);
         for (const auto& location : handler.includes) {
+            // The reader never fetches a location with a scheme; without a catalog
+            // the floor reads what the reader reads.
+            if (hasScheme(location))
+                continue;
             std::string included = includedPath(path, location);
             if (queued.insert(documentKey(included)).second)
                 queue.push_back(std::move(included));

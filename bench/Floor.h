@@ -1,7 +1,7 @@
 // The floor of the benchmarks: the schema reader's own parser, configured exactly as
 // a read configures it, over the documents a read parses, in the reader's order,
-// with a handler that does nothing but follow includes. zrbench times it inside its
-// own process; zrfloor runs it as a process of its own, against which whole zrdict
+// with a handler that does nothing but follow includes, imports and redefinitions. zrbench times it
+// inside its own process; zrfloor runs it as a process of its own, against which whole zrdict
 // processes are timed.
 #pragma once
 

@@ -24,4 +24,10 @@ elif ! grep -q '^CMAKE_BUILD_TYPE:STRING=Release$' "$build/CMakeCache.txt"; then
 fi
 cmake --build "$build" -j2 --target zrbench >&2
 
+# Without arguments, a multi-namespace set joins the generated ones when the shared
+# real-world sets are beside the repository: UBL's invoice and the documents it imports.
+ubl="$root/../shared/corpus/ubl-2.5/xsdrt/maindoc/UBL-Invoice-2.5.xsd"
+if [[ $# -eq 0 && -f "$ubl" ]]; then
+    set -- --sizes 1000,10000,100000 --schema "$ubl"
+fi
 exec "$build/bin/zrbench" "$@"
