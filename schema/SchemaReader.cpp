@@ -142,7 +142,7 @@ bool SchemaReader::read(const ZrWChar* path) {
 
 bool SchemaReader::readQueue(SchemaParser& parser, std::deque<QueuedDocument>& queue) {
     while (!queue.empty()) {
-        startDocument(queue.front());
+        beginDocument(queue.front());
         queue.pop_front();
         if (currentDocument.imported && currentDocument.text.empty() &&
             !FPInputStream(documentPath_.c_str(), false).isOpen()) {
@@ -169,7 +169,7 @@ bool SchemaReader::readQueue(SchemaParser& parser, std::deque<QueuedDocument>& q
     return true;
 }
 
-void SchemaReader::startDocument(const QueuedDocument& document) {
+void SchemaReader::beginDocument(const QueuedDocument& document) {
     currentDocument = document;
     documentPath_ = document.path;
     documentURI = documentPath_.c_str();

@@ -190,7 +190,7 @@ class SchemaReader : public xercesc::HandlerBase {
     // Reads the queued documents of one queue; false when a document of the main
     // schema failed.
     bool readQueue(SchemaParser& parser, std::deque<QueuedDocument>& queue);
-    void startDocument(const QueuedDocument& document);
+    void beginDocument(const QueuedDocument& document);
     // An imported document that failed: noted in the model, its partial state dropped.
     void noteFailedImport(const ZrWString& reason);
     // Notes once why a document imported for `ns` from `location` was not read.
