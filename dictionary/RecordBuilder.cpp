@@ -273,7 +273,7 @@ bool RecordBuilder::addReference(const ElementDef& reference, ZrRecord* record) 
 
 bool RecordBuilder::addGroup(const ElementDef& reference, ZrRecord* record) {
     const ComplexTypeDef* group =
-        model.findComplexType(reference.groupName.view(), reference.groupNs.view());
+        model.findGroup(reference.groupName.view(), reference.groupNs.view());
     if (!group) {
         ZrGlob::LogMessage(ZR_SEV_ERROR, 4, "Unable to find group %S", reference.groupName.c_str());
         resolver.explainMissing(reference.groupNs.view());

@@ -102,8 +102,14 @@ inline bool isAnonName(std::u16string_view name) {
     return name.size() >= 4 && name.substr(0, 4) == u"anon";
 }
 
+// The symbol space a component's name belongs to: types and groups may share names.
+template <class T> int namedKind(const T&) { return 0; }
+
+inline int namedKind(const ComplexTypeDef& type) { return type.isGroup ? 1 : 0; }
+
 // An insertion-ordered list of named components with lookups that answer exactly
-// what a first-match scan from the start would, in constant time. Entries are held
+// what a first-match scan from the start over the components of one kind (see
+// namedKind) would, in constant time. Entries are held
 // in a deque, so references stay valid while entries are appended. The indexes hold
 // positions only and compare against the entries themselves, so a lookup allocates
 // nothing; an entry's name must not change while it is in the list.
@@ -148,32 +154,33 @@ template <class T> class NamedList {
 
     const_iterator end() const { return items_.end(); }
 
-    // First entry whose name equals `name` and, unless `name` begins with "anon",
-    // whose nameNs equals `ns`; null when none.
-    T* find(std::u16string_view name, std::u16string_view ns) {
+    // First entry of `kind` whose name equals `name` and, unless `name` begins with
+    // "anon", whose nameNs equals `ns`; null when none.
+    T* find(std::u16string_view name, std::u16string_view ns, int kind = 0) {
         if (isAnonName(name)) {
-            const size_t pos = byName_.find(
-                nhash(name), [&](size_t at) { return zrSameText(items_[at].name.view(), name); });
+            const size_t pos = byName_.find(nhash(name) ^ kindHash(kind), [&](size_t at) {
+                return namedKind(items_[at]) == kind && zrSameText(items_[at].name.view(), name);
+            });
             return pos == npos ? nullptr : &items_[pos];
         }
-        return findExact(name, ns);
+        return findExact(name, ns, kind);
     }
 
-    const T* find(std::u16string_view name, std::u16string_view ns) const {
-        return const_cast<NamedList*>(this)->find(name, ns);
+    const T* find(std::u16string_view name, std::u16string_view ns, int kind = 0) const {
+        return const_cast<NamedList*>(this)->find(name, ns, kind);
     }
 
-    // First entry whose name and nameNs equal `name` and `ns`; null when none.
-    T* findExact(std::u16string_view name, std::u16string_view ns) {
-        const size_t pos = byQName_.find(qhash(name, ns), [&](size_t at) {
-            return zrSameText(items_[at].name.view(), name) &&
+    // First entry of `kind` whose name and nameNs equal `name` and `ns`; null when none.
+    T* findExact(std::u16string_view name, std::u16string_view ns, int kind = 0) {
+        const size_t pos = byQName_.find(qhash(name, ns) ^ kindHash(kind), [&](size_t at) {
+            return namedKind(items_[at]) == kind && zrSameText(items_[at].name.view(), name) &&
                    zrSameText(items_[at].nameNs.view(), ns);
         });
         return pos == npos ? nullptr : &items_[pos];
     }
 
-    const T* findExact(std::u16string_view name, std::u16string_view ns) const {
-        return const_cast<NamedList*>(this)->findExact(name, ns);
+    const T* findExact(std::u16string_view name, std::u16string_view ns, int kind = 0) const {
+        return const_cast<NamedList*>(this)->findExact(name, ns, kind);
     }
 
   private:
@@ -262,6 +269,8 @@ template <class T> class NamedList {
 
     static size_t nhash(std::u16string_view name) { return size_t(zrTextHash(name)); }
 
+    static size_t kindHash(int kind) { return size_t(kind) * 0x9e3779b97f4a7c15ull; }
+
     static size_t qhash(std::u16string_view name, std::u16string_view ns) {
         const size_t h = nhash(name);
         return h ^ (nhash(ns) + 0x9e3779b97f4a7c15ull + (h << 6) + (h >> 2));
@@ -272,12 +281,15 @@ template <class T> class NamedList {
         const T& item = items_.back();
         const std::u16string_view name = item.name.view();
         const std::u16string_view ns = item.nameNs.view();
-        byQName_.insertFirst(qhash(name, ns), last, [&](size_t at) {
-            return items_[at].name.view() == name && items_[at].nameNs.view() == ns;
+        const int kind = namedKind(item);
+        byQName_.insertFirst(qhash(name, ns) ^ kindHash(kind), last, [&](size_t at) {
+            return namedKind(items_[at]) == kind && items_[at].name.view() == name &&
+                   items_[at].nameNs.view() == ns;
         });
         if (isAnonName(name))
-            byName_.insertFirst(nhash(name), last,
-                                [&](size_t at) { return items_[at].name.view() == name; });
+            byName_.insertFirst(nhash(name) ^ kindHash(kind), last, [&](size_t at) {
+                return namedKind(items_[at]) == kind && items_[at].name.view() == name;
+            });
     }
 
     std::deque<T> items_;
@@ -356,8 +368,14 @@ struct SchemaModel {
 
     void clear();
 
+    // Complex types and groups have names of their own: a type and a group may share one.
     const ComplexTypeDef* findComplexType(std::u16string_view localName,
                                           std::u16string_view namespaceURI) const {
-        return complexTypes.find(localName, namespaceURI);
+        return complexTypes.find(localName, namespaceURI, 0);
+    }
+
+    const ComplexTypeDef* findGroup(std::u16string_view localName,
+                                    std::u16string_view namespaceURI) const {
+        return complexTypes.find(localName, namespaceURI, 1);
     }
 };
