@@ -236,6 +236,10 @@ void dtLimits(ZrDType& type, const char16_t* minInclusive, const char16_t* maxIn
               const char16_t* minExclusive, const char16_t* maxExclusive) {
     if (limitsIgnoredFor(type.Usage() & ~256))
         return;
+    // A lower bound alone says nothing about how wide the values grow: xs:int from
+    // 1 up still takes ten digits.
+    if (isEmpty(maxInclusive) && isEmpty(maxExclusive))
+        return;
     // Magnitudes in 64 bits: the smallest 32-bit value has no 32-bit magnitude.
     int64_t low = 0;
     if (!isEmpty(minInclusive))

@@ -1,6 +1,7 @@
 // Field typing: pattern lengths, numeric limits, simple-type resolution.
 #include "FieldTyping.h"
 #include "TestSupport.h"
+#include "dictionary_support.h"
 
 #include <cstdint>
 #include <gtest/gtest.h>
@@ -191,12 +192,15 @@ const LimitCase kLimits[] = {
     {"MaxExclusive1000", "int", false, "", "", "", "1000", 3},
     {"MaxExclusiveZero", "int", false, "", "", "", "0", 1},
     {"SignTakesNoDigit", "int", false, "-50", "9", "", "", 2},
-    {"SmallestInt", "int", false, "-2147483648", "", "", "", 10},
-    {"SmallestIntExclusive", "int", false, "", "", "-2147483648", "", 10},
-    {"ClampedBelowRange", "long", false, "-99999999999", "", "", "", 10},
+    {"SmallestInt", "int", false, "-2147483648", "0", "", "", 10},
+    {"SmallestIntExclusive", "int", false, "", "0", "-2147483648", "", 10},
+    {"ClampedBelowRange", "long", false, "-99999999999", "0", "", "", 10},
     {"ClampedAboveRange", "long", false, "", "99999999999", "", "", 10},
-    {"MinExclusiveAddsOne", "int", false, "", "", "99", "", 3},
-    {"InclusiveBeatsExclusive", "int", false, "5", "", "99999", "", 1},
+    {"MinExclusiveAddsOne", "int", false, "", "5", "99", "", 3},
+    {"InclusiveBeatsExclusive", "int", false, "5", "9", "99999", "", 1},
+    {"LowerBoundAlone", "int", false, "1", "", "", "", kUnchanged},
+    {"LowerExclusiveAlone", "nonNegativeInteger", false, "", "", "0", "", kUnchanged},
+    {"UpperBoundAlone", "int", false, "", "99", "", "", 2},
     {"ExponentIgnored", "int", false, "", "1e5", "", "", 1},
     {"LeadingBlanksAndSign", "int", false, "", "  +42", "", "", 2},
     {"NoNumberIsZero", "int", false, "", "abc", "", "", kUnchanged},
@@ -435,5 +439,46 @@ TEST(ResolveSimpleType, LongBaseChainsAreBounded) {
         }
     }
 }
+
+// Field types of whole schemas, read the way a host reads them.
+struct SchemaTypingCase {
+    const char* label;
+    const char* body;
+    const char* records;
+};
+
+void PrintTo(const SchemaTypingCase& row, std::ostream* os) { *os << row.label; }
+
+const SchemaTypingCase kSchemaTyping[] = {
+    {"LowerBoundsAloneKeepTheWidth",
+     R"(<xs:element name="r"><xs:complexType><xs:sequence>
+          <xs:element name="count"><xs:simpleType><xs:restriction base="xs:int">
+            <xs:minInclusive value="1"/></xs:restriction></xs:simpleType></xs:element>
+          <xs:element name="size"><xs:simpleType><xs:restriction base="xs:nonNegativeInteger">
+            <xs:minExclusive value="0"/></xs:restriction></xs:simpleType></xs:element>
+          <xs:element name="month"><xs:simpleType><xs:restriction base="xs:int">
+            <xs:minInclusive value="1"/><xs:maxInclusive value="12"/>
+          </xs:restriction></xs:simpleType></xs:element>
+          <xs:element name="small"><xs:simpleType><xs:restriction base="xs:int">
+            <xs:maxExclusive value="100"/></xs:restriction></xs:simpleType></xs:element>
+        </xs:sequence></xs:complexType></xs:element>)",
+     "r(0):\n"
+     "  count: int(48) 0/10/0 null\n"
+     "  size: nonNegativeInteger(51) 0/10/0 null\n"
+     "  month: int(48) 2/2/0 null\n"
+     "  small: int(48) 2/2/0 null\n"},
+};
+
+class SchemaTyping : public ::testing::TestWithParam<SchemaTypingCase> {};
+
+TEST_P(SchemaTyping, FieldTypes) {
+    const zrtest::SchemaRead read = zrtest::readInline(GetParam().body);
+    EXPECT_TRUE(read.ok) << read.messages;
+    EXPECT_EQ(read.records, GetParam().records);
+    EXPECT_EQ(read.messages, "");
+}
+
+INSTANTIATE_TEST_SUITE_P(Dictionary, SchemaTyping, ::testing::ValuesIn(kSchemaTyping),
+                         [](const auto& row) { return std::string(row.param.label); });
 
 } // namespace
