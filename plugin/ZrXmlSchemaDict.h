@@ -21,7 +21,8 @@ class ZRBXMLS_API ZrXmlSchemaDict : public ZrDictBrowser {
     int OptionDefCount() const override;
     const ZrOptionDef** GetOptionDefs() const override;
     // Appends one field per field of `source` to `target`, translating data types
-    // through `spoke` when one is given. 0, or 5 when a field cannot be allocated.
+    // through `spoke` when one is given. 0, or 5 when a field cannot be made: memory
+    // ran out or the connector threw; the fields appended before stay.
     BATCHERR FlattenDictRecord(const ZrRecord* source, ZrRecord* target, ZrSpoke* spoke) override;
 
     bool QualifiedRecords() const { return qualifiedRecords; }

@@ -1,8 +1,10 @@
 // Copying the fields of any record into another, one level deep, with data types
 // translated by the host's connector when one is given.
 #include "ZrXmlSchemaDict.h"
+#include "zrglob.h"
 
 #include <climits>
+#include <exception>
 #include <memory>
 #include <new>
 
@@ -13,6 +15,17 @@ long addLengths(long a, long b) {
     if (__builtin_add_overflow(a, b, &sum))
         return b > 0 ? LONG_MAX : LONG_MIN;
     return sum;
+}
+
+// Formatting the message may itself run out of memory; nothing may reach the host.
+void logFlattenStopped(const ZrRecord& source, const ZrField& field, const ZrWChar* reason) {
+    try {
+        ZrGlob::LogMessage(
+            ZR_SEV_ERROR, BE_NO_MEMORY,
+            lgettext(u"ZrXmlSchemaDict: Flattening record %s stopped at field %s: %s"),
+            source.name.c_str(), field.FieldName().c_str(), reason);
+    } catch (...) {
+    }
 }
 
 } // namespace
@@ -30,9 +43,9 @@ BATCHERR ZrXmlSchemaDict::FlattenDictRecord(const ZrRecord* source, ZrRecord* ta
         if (!from)
             continue;
         std::unique_ptr<ZrField> field;
-        // Running out of memory while making the field, in this code or in the
-        // connector's translation, is the one failure: the fields already appended
-        // stay, and the record length is left alone.
+        // Anything thrown while making the field, in this code or in the connector's
+        // translation, stops the copy: the fields already appended stay, and the
+        // record length is left alone.
         try {
             if (spoke) {
                 ZrDType mapped = spoke->MapDataType(from->DataType());
@@ -46,12 +59,24 @@ BATCHERR ZrXmlSchemaDict::FlattenDictRecord(const ZrRecord* source, ZrRecord* ta
             field->FieldName(from->FieldName());
             field->Alias(from->FieldName());
             field->Description(from->Description());
+            if (!target->AppendField(field.get()))
+                return BE_NO_MEMORY;
+            field.release();
         } catch (const std::bad_alloc&) {
+            logFlattenStopped(*source, *from, u"out of memory");
+            return BE_NO_MEMORY;
+        } catch (const std::exception& e) {
+            ZrWString reason;
+            try {
+                reason.Assign(e.what(), ZR_CSET_DEFAULT, -1);
+            } catch (...) {
+            }
+            logFlattenStopped(*source, *from, reason.c_str());
+            return BE_NO_MEMORY;
+        } catch (...) {
+            logFlattenStopped(*source, *from, u"unknown error");
             return BE_NO_MEMORY;
         }
-        if (!target->AppendField(field.get()))
-            return BE_NO_MEMORY;
-        field.release();
     }
     if (initialLength != 0)
         return BE_OK;

@@ -1,9 +1,11 @@
 // Record flattening: field copies one level deep, connector translation with the
 // source length kept, and the record-length rule.
+#include "TestSupport.h"
 #include "ZrXmlSchemaDict.h"
 
 #include <gtest/gtest.h>
 #include <new>
+#include <stdexcept>
 #include <string>
 #include <vector>
 
@@ -22,8 +24,13 @@ class TextSpoke : public ZrSpoke {
   public:
     ZrDType MapDataType(const ZrDType& type) override {
         ++calls;
-        if (failAtCall == calls)
+        if (failAtCall == calls) {
+            if (failure == Failure::Runtime)
+                throw std::runtime_error("no such type here");
+            if (failure == Failure::Foreign)
+                throw 42;
             throw std::bad_alloc();
+        }
         ZrDType text;
         text.Define("Text;alias=Character;padchar_invalid;usage=0");
         text.Length(type.Length() + 1000);
@@ -31,8 +38,11 @@ class TextSpoke : public ZrSpoke {
         return text;
     }
 
+    enum class Failure { OutOfMemory, Runtime, Foreign };
+
     int calls = 0;
     int failAtCall = 0;
+    Failure failure = Failure::OutOfMemory;
 };
 
 ZrRecord sourceRecord(const std::vector<long>& lengths) {
@@ -137,14 +147,33 @@ TEST(PluginFlatten, ConnectorTranslatesButSourceLengthWins) {
     EXPECT_STREQ(target.GetFieldbyPos(1)->Description(), "described 0");
 }
 
-TEST(PluginFlatten, OutOfMemoryKeepsEarlierFieldsAndLength) {
-    ZrXmlSchemaDict dict(nullptr);
-    const ZrRecord source = sourceRecord({3, 4, 5, 6});
-    TextSpoke spoke;
-    spoke.failAtCall = 3;
-    ZrRecord target;
-    EXPECT_EQ(dict.FlattenDictRecord(&source, &target, &spoke), BE_NO_MEMORY);
-    EXPECT_EQ(dump(target), "(0) f0/f0:Character=3 f1/f1:Character=4");
+// Whatever the connector throws stays in the plug-in: the call fails with 5 and a
+// message, and keeps the fields appended before.
+TEST(PluginFlatten, ConnectorFailureKeepsEarlierFieldsAndLength) {
+    const struct {
+        TextSpoke::Failure failure;
+        const char* reason;
+    } cases[] = {
+        {TextSpoke::Failure::OutOfMemory, "out of memory"},
+        {TextSpoke::Failure::Runtime, "no such type here"},
+        {TextSpoke::Failure::Foreign, "unknown error"},
+    };
+
+    for (const auto& c : cases) {
+        ZrXmlSchemaDict dict(nullptr);
+        const ZrRecord source = sourceRecord({3, 4, 5, 6});
+        TextSpoke spoke;
+        spoke.failAtCall = 3;
+        spoke.failure = c.failure;
+        ZrRecord target;
+        zrtest::LogCapture log;
+        EXPECT_EQ(dict.FlattenDictRecord(&source, &target, &spoke), BE_NO_MEMORY) << c.reason;
+        EXPECT_EQ(dump(target), "(0) f0/f0:Character=3 f1/f1:Character=4");
+        EXPECT_EQ(
+            log.lines(),
+            std::string("4 5 ZrXmlSchemaDict: Flattening record source stopped at field f2: ") +
+                c.reason + "\n");
+    }
 }
 
 TEST(PluginFlatten, RecordIntoItselfCopiesEachFieldOnce) {
