@@ -10,13 +10,11 @@ XMLSize_t FPInputStream::chunkLimit = 0;
 
 FPInputSource::FPInputSource(const ZrWChar* documentPath)
     : xercesc::InputSource(xercesc::XMLPlatformUtils::fgMemoryManager), path(documentPath) {
-    const size_t length = static_cast<size_t>(path.length());
-    systemId = new XMLCh[length + 1];
-    std::copy(path.c_str(), path.c_str() + length + 1, systemId);
-    setSystemId(systemId);
+    // The source keeps its own copy of the system id.
+    setSystemId(path.c_str());
 }
 
-FPInputSource::~FPInputSource() { delete[] systemId; }
+FPInputSource::~FPInputSource() = default;
 
 // A null stream makes the parser report that the document cannot be opened, which
 // fails the read through its error callbacks.
@@ -60,7 +58,7 @@ XMLSize_t FPInputStream::readBytes(XMLByte* buffer, XMLSize_t maxToRead) {
             *readError = true;
         return 0;
     }
-    position += static_cast<uint32_t>(count);
+    position += static_cast<XMLFilePos>(count);
     return static_cast<XMLSize_t>(count);
 }
 

@@ -24,7 +24,6 @@ class FPInputSource : public xercesc::InputSource {
 
   private:
     ZrWString path;
-    XMLCh* systemId = nullptr;
     bool designMode = false;
     // Shared with the streams, which the parser may keep a little longer.
     std::shared_ptr<bool> readError = std::make_shared<bool>(false);
@@ -52,7 +51,7 @@ class FPInputStream : public xercesc::BinInputStream {
 
   private:
     ZrFileProxy fileProxy;
-    uint32_t position = 0;
+    XMLFilePos position = 0;
     ZrWString path;
     std::shared_ptr<bool> readError;
 };

@@ -5,6 +5,9 @@
 
 #include <gtest/gtest.h>
 #include <sstream>
+#include <sys/mman.h>
+#include <unistd.h>
+#include <vector>
 #include <xercesc/sax/SAXParseException.hpp>
 
 namespace {
@@ -213,6 +216,25 @@ TEST(Driver, PredefinedEntitiesAreNotLimited) {
                                                       "</xs:documentation></xs:annotation>"));
     EXPECT_TRUE(read.ok);
     EXPECT_EQ(read.log, "");
+}
+
+// Positions count past 4 GiB. The file lives in memory and is all hole, so
+// reading it costs no disk and little time.
+TEST(Driver, InputPositionsPassFourGigabytes) {
+    const int fd = memfd_create("big.xsd", MFD_CLOEXEC);
+    if (fd < 0)
+        GTEST_SKIP() << "no memory file here";
+    const off_t size = (off_t(1) << 32) + 17;
+    ASSERT_EQ(ftruncate(fd, size), 0);
+    {
+        FPInputStream stream(wide("/proc/self/fd/" + std::to_string(fd)).c_str(), false);
+        ASSERT_TRUE(stream.isOpen());
+        std::vector<XMLByte> buffer(std::size_t(1) << 20);
+        while (stream.readBytes(buffer.data(), buffer.size()) != 0) {
+        }
+        EXPECT_EQ(stream.curPos(), XMLFilePos(size));
+    }
+    close(fd);
 }
 
 } // namespace
