@@ -71,6 +71,7 @@ ZrWString generatedName(int32_t number) {
     ZrWString name(u"anon");
     for (char c : std::to_string(number))
         name += ZrWChar(c);
+    name += u'\0'; // see isGeneratedName
     return name;
 }
 

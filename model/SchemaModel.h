@@ -102,6 +102,13 @@ inline bool isAnonName(std::u16string_view name) {
     return name.size() >= 4 && name.substr(0, 4) == u"anon";
 }
 
+// Names the reader generates for anonymous types end in a NUL, which no name in an
+// XML document can hold, so no name a schema gives can equal one; as C text, the
+// way messages print it, the name reads "anonN".
+inline bool isGeneratedName(std::u16string_view name) {
+    return !name.empty() && name.back() == u'\0';
+}
+
 // The symbol space a component's name belongs to: types and groups may share names.
 template <class T> int namedKind(const T&) { return 0; }
 

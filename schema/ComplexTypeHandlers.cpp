@@ -3,12 +3,13 @@
 
 namespace {
 
-// Gives a component without a name the next generated one.
+// Gives a component without a name the next generated one (see isGeneratedName).
 void nameIfAnonymous(ZrName& name, int32_t& anonCount) {
     if (!name.empty())
         return;
     ZrWString generated;
     wsfmt(generated, u"anon%d", anonCount++);
+    generated += u'\0';
     name = generated.view();
 }
 

@@ -467,6 +467,26 @@ const SchemaTypingCase kSchemaTyping[] = {
      "  size: nonNegativeInteger(51) 0/10/0 null\n"
      "  month: int(48) 2/2/0 null\n"
      "  small: int(48) 2/2/0 null\n"},
+
+    // A declaration's own anonymous type is its type, whatever the schema names its
+    // types: here the generated names would be anon0 (r's type) and anon1.
+    {"SchemaNamesDoNotCaptureAnonymousTypes",
+     R"(<xs:complexType name="anon0"><xs:sequence>
+          <xs:element name="wrong" type="xs:string"/></xs:sequence></xs:complexType>
+        <xs:simpleType name="anon1"><xs:restriction base="xs:string">
+          <xs:maxLength value="3"/></xs:restriction></xs:simpleType>
+        <xs:element name="r"><xs:complexType><xs:sequence>
+          <xs:element name="inline"><xs:simpleType><xs:restriction base="xs:int">
+            <xs:maxInclusive value="99999"/></xs:restriction></xs:simpleType></xs:element>
+          <xs:element name="named" type="anon1"/>
+          <xs:element name="box" type="anon0"/>
+        </xs:sequence></xs:complexType></xs:element>)",
+     "r(0):\n"
+     "  inline: int(48) 5/5/0 null\n"
+     "  named: string(16) 3/0/0 null\n"
+     "  box: Record(2) 0/0/0 notnull\n"
+     "box(0):\n"
+     "  wrong: string(16) 0/0/0 null\n"},
 };
 
 class SchemaTyping : public ::testing::TestWithParam<SchemaTypingCase> {};

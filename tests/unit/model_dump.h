@@ -19,14 +19,15 @@ inline const bool kParserLibraryReady = [] {
 }();
 
 // "{ns}local", or "local" without a namespace; the XML Schema namespace prints
-// as "xs".
+// as "xs". A generated name prints as messages show it, "anonN".
 inline std::string qname(const ZrName& local, const ZrName& ns) {
+    const std::string text = utf8(std::u16string_view(local.c_str()));
     if (ns.empty())
-        return utf8(local);
+        return text;
     std::string uri = utf8(ns);
     if (uri == kXsdNs)
         uri = "xs";
-    return "{" + uri + "}" + utf8(local);
+    return "{" + uri + "}" + text;
 }
 
 inline std::string dumpElement(const ElementDef& e) {
