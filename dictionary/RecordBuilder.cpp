@@ -3,6 +3,7 @@
 #include "zrglob.h"
 
 #include <string>
+#include <unordered_set>
 
 namespace {
 
@@ -65,6 +66,45 @@ class RecordScope {
     std::vector<const void*>& stack_;
     size_t& floor_;
     size_t savedFloor_;
+};
+
+// Marks a restriction whose base is being drawn in.
+class RestrictionScope {
+  public:
+    RestrictionScope(std::vector<const ComplexTypeDef*>& stack, const ComplexTypeDef& type)
+        : stack_(type.restriction ? &stack : nullptr) {
+        if (stack_)
+            stack_->push_back(&type);
+    }
+
+    RestrictionScope(const RestrictionScope&) = delete;
+    RestrictionScope& operator=(const RestrictionScope&) = delete;
+
+    ~RestrictionScope() {
+        if (stack_)
+            stack_->pop_back();
+    }
+
+  private:
+    std::vector<const ComplexTypeDef*>* stack_;
+};
+
+// Sets a list of restrictions aside while content that no restriction around it
+// narrows is built: a nested record, or a text field.
+class RestrictionsAside {
+  public:
+    explicit RestrictionsAside(std::vector<const ComplexTypeDef*>& stack) : stack_(stack) {
+        saved_.swap(stack_);
+    }
+
+    RestrictionsAside(const RestrictionsAside&) = delete;
+    RestrictionsAside& operator=(const RestrictionsAside&) = delete;
+
+    ~RestrictionsAside() { saved_.swap(stack_); }
+
+  private:
+    std::vector<const ComplexTypeDef*>& stack_;
+    std::vector<const ComplexTypeDef*> saved_;
 };
 
 ZrWString generatedName(int32_t number) {
@@ -133,6 +173,7 @@ ZrRecord* RecordBuilder::buildRecord(const ElementDef& declaration) {
         resolver.explainMissing(declaration.typeNs.view());
     } else {
         RecordScope scope(expansionStack, expansionFloor, type);
+        RestrictionsAside aside(restrictingTypes);
         built = addDerivedContent(*type, record->name, record);
         for (auto it = type->content.begin(); built && it != type->content.end(); ++it)
             built = addField(*it, record);
@@ -187,6 +228,7 @@ bool RecordBuilder::addDerivedContent(const ComplexTypeDef& type, const ZrWStrin
     if (depth.tooDeep(base->name.c_str()))
         return false;
     ExpansionScope expanding(expansionStack, base);
+    RestrictionScope restricting(restrictingTypes, type);
     bool added = addDerivedContent(*base, recordName, record);
     for (auto it = base->content.begin(); added && it != base->content.end(); ++it)
         added = addField(*it, record);
@@ -220,6 +262,7 @@ bool RecordBuilder::addTextField(const ZrWString& recordName, const ZrName& type
     text.name = recordName.view();
     text.typeName = typeName;
     text.typeNs = typeNs;
+    RestrictionsAside aside(restrictingTypes);
     return addField(text, record);
 }
 
@@ -230,6 +273,18 @@ bool RecordBuilder::addField(const ElementDef& declaration, ZrRecord* record) {
         return addReference(declaration, record);
     if (!declaration.groupName.empty())
         return addGroup(declaration, record);
+    if (declaration.prohibited)
+        return true;
+    // Of a restricted base, the restriction's own content replaces the elements and
+    // restates the attributes it changes.
+    if (!restrictingTypes.empty()) {
+        if (!declaration.isAttribute)
+            return true;
+        for (const ComplexTypeDef* restriction : restrictingTypes) {
+            if (restates(*restriction, declaration))
+                return true;
+        }
+    }
 
     // Only names that found no complex type are kept as field types, so a kept one
     // spares the complex-type lookup.
@@ -270,6 +325,32 @@ bool RecordBuilder::addReference(const ElementDef& reference, ZrRecord* record) 
         return false;
     ExpansionScope expanding(expansionStack, target);
     return addField(*target, record);
+}
+
+bool RecordBuilder::restates(const ComplexTypeDef& restriction, const ElementDef& attribute) const {
+    std::vector<const std::vector<ElementDef>*> pending{&restriction.content};
+    // Each group is looked into once, however often it is referred to.
+    std::unordered_set<const ComplexTypeDef*> seen;
+    while (!pending.empty()) {
+        const std::vector<ElementDef>& content = *pending.back();
+        pending.pop_back();
+        for (const ElementDef& entry : content) {
+            const ElementDef* declared = &entry;
+            if (!entry.refName.empty()) {
+                declared = model.globalElements.findExact(entry.refName.view(), entry.refNs.view());
+            } else if (!entry.groupName.empty()) {
+                const ComplexTypeDef* group =
+                    model.findGroup(entry.groupName.view(), entry.groupNs.view());
+                if (group && seen.insert(group).second)
+                    pending.push_back(&group->content);
+                continue;
+            }
+            if (declared && declared->isAttribute && declared->name == attribute.name &&
+                declared->nameNs == attribute.nameNs)
+                return true;
+        }
+    }
+    return false;
 }
 
 bool RecordBuilder::addGroup(const ElementDef& reference, ZrRecord* record) {

@@ -37,6 +37,9 @@ class RecordBuilder {
     bool addTextField(const ZrWString& recordName, const ZrName& typeName, const ZrName& typeNs,
                       ZrRecord* record);
     bool addReference(const ElementDef& reference, ZrRecord* record);
+    // Whether the content of `restriction`, its attribute groups and references
+    // included, declares an attribute named as `attribute`.
+    bool restates(const ComplexTypeDef& restriction, const ElementDef& attribute) const;
     bool addGroup(const ElementDef& reference, ZrRecord* record);
     // `kept`: the declaration's type as kept from an earlier field, or null.
     bool addSimpleField(const ElementDef& declaration, ZrRecord* record, const ZrDType* kept);
@@ -81,6 +84,9 @@ class RecordBuilder {
     // records around it, whose expansions a nested record may legitimately repeat.
     std::vector<const void*> expansionStack;
     size_t expansionFloor = 0;
+    // Restrictions whose bases are being drawn into the record under construction:
+    // of those bases only the attributes no restriction here restates are taken.
+    std::vector<const ComplexTypeDef*> restrictingTypes;
     // addField and buildRecord calls so far, and their ceiling.
     long buildSteps = 0;
     long buildStepLimit = 0;

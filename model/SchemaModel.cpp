@@ -10,6 +10,7 @@ void ElementDef::clear() {
     groupName.clear();
     groupNs.clear();
     isAttribute = false;
+    prohibited = false;
 }
 
 void SimpleTypeDef::clear() {
@@ -39,6 +40,7 @@ void ComplexTypeDef::clear() {
     content.clear();
     isGroup = false;
     simpleContent = false;
+    restriction = false;
     SimpleTypeDef::clear();
 }
 

@@ -30,6 +30,9 @@ class ElementDef {
     ZrName groupNs;
     bool isAttribute = false;
     bool nullable = true;
+    // An attribute declared with use="prohibited": it gives no field, and takes
+    // the attribute of that name away from the base of a restriction.
+    bool prohibited = false;
 
     // Empties the strings and resets isAttribute; nullable is kept, so a nested
     // declaration inherits the flag of the one around it.
@@ -85,6 +88,9 @@ class ComplexTypeDef : public SimpleTypeDef {
     std::vector<ElementDef> content;
     bool isGroup = false;
     bool simpleContent = false;
+    // Derived from its base by restriction: the content restates what it keeps of
+    // the base, so only the base's attributes that it does not restate are drawn in.
+    bool restriction = false;
 
     ComplexTypeDef() = default;
     ComplexTypeDef(const ComplexTypeDef&) = default;

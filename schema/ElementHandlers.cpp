@@ -22,6 +22,8 @@ void SchemaReader::doElement(xercesc::AttributeList& attrs, bool isAttribute) {
             parseName(value, true, currentElement.typeName, currentElement.typeNs);
         } else if (attr == u"ref") {
             parseName(value, false, currentElement.refName, currentElement.refNs);
+        } else if (attr == u"use") {
+            currentElement.prohibited = isAttribute && xmlText(value) == u"prohibited";
         } else if (attr == u"nullable") {
             currentElement.nullable = ZrGlob::wcscmpi(value ? value : u"", u"false") != 0;
         }

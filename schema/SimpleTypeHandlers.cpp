@@ -53,6 +53,8 @@ void SchemaReader::finishSimpleType() {
 void SchemaReader::doRestriction(xercesc::AttributeList& attrs) {
     if (simpleDepth != 0)
         currentDerivation = Derivation::Restriction;
+    if (typeTarget == &currentComplexType)
+        currentComplexType.restriction = true;
     for (XMLSize_t i = 0; i < attrs.getLength(); ++i) {
         if (XmlName(attrs.getName(i)) != u"base" || !typeTarget)
             continue;

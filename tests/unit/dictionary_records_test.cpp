@@ -300,6 +300,68 @@ const RecordCase kCases[] = {
      "4 0 Lookup of type 'anon0' (ns '') failed for field 'label'\n",
      false},
 
+    // A restriction restates the content it keeps: its own elements replace the
+    // base's, and of the base's attributes those it neither restates nor prohibits
+    // stay, where the base is drawn in.
+    {"RestrictionReplacesTheBaseElements",
+     R"(<xs:complexType name="Base"><xs:sequence>
+          <xs:element name="a" type="xs:int"/>
+          <xs:element name="b" type="xs:string" minOccurs="0"/>
+        </xs:sequence><xs:attribute name="x" type="xs:string"/></xs:complexType>
+        <xs:complexType name="Narrow"><xs:complexContent><xs:restriction base="Base">
+          <xs:sequence><xs:element name="a" type="xs:int"/></xs:sequence>
+        </xs:restriction></xs:complexContent></xs:complexType>
+        <xs:element name="narrow" type="Narrow"/>)",
+     "narrow(0):\n"
+     "  x: string attribute(272) 0/0/0 null\n"
+     "  a: int(48) 0/10/0 null\n"},
+
+    {"RestrictionRestatesOrProhibitsBaseAttributes",
+     R"(<xs:attributeGroup name="Common"><xs:attribute name="id" type="xs:ID"/>
+          <xs:attribute name="lang" type="xs:language"/></xs:attributeGroup>
+        <xs:attribute name="note" type="xs:string"/>
+        <xs:complexType name="Base"><xs:sequence><xs:element name="a" type="xs:int"/>
+          </xs:sequence><xs:attribute name="x" type="xs:string"/>
+          <xs:attribute name="y" type="xs:string"/>
+          <xs:attributeGroup ref="Common"/><xs:attribute ref="note"/></xs:complexType>
+        <xs:complexType name="Narrow"><xs:complexContent><xs:restriction base="Base">
+          <xs:sequence><xs:element name="a" type="xs:int"/></xs:sequence>
+          <xs:attribute name="x"><xs:simpleType><xs:restriction base="xs:string">
+            <xs:maxLength value="2"/></xs:restriction></xs:simpleType></xs:attribute>
+          <xs:attribute name="y" use="prohibited"/>
+          <xs:attribute name="lang" type="xs:language" use="prohibited"/>
+          <xs:attribute ref="note" use="required"/>
+        </xs:restriction></xs:complexContent></xs:complexType>
+        <xs:element name="narrow" type="Narrow"/>)",
+     "narrow(0):\n"
+     "  id: ID attribute(288) 0/0/0 null\n"
+     "  a: int(48) 0/10/0 null\n"
+     "  x: string attribute(272) 2/0/0 null\n"
+     "  note: string attribute(272) 0/0/0 null\n"},
+
+    // Restricting an extension narrows what the whole chain gave; extending a
+    // restriction adds to what the restriction kept.
+    {"RestrictionAndExtensionChained",
+     R"(<xs:complexType name="Base"><xs:sequence><xs:element name="a" type="xs:int"/>
+          </xs:sequence><xs:attribute name="x" type="xs:string"/></xs:complexType>
+        <xs:complexType name="Ext"><xs:complexContent><xs:extension base="Base">
+          <xs:sequence><xs:element name="c" type="xs:int"/></xs:sequence>
+          <xs:attribute name="y" type="xs:string"/></xs:extension></xs:complexContent>
+        </xs:complexType>
+        <xs:complexType name="Narrow"><xs:complexContent><xs:restriction base="Ext">
+          <xs:sequence><xs:element name="c" type="xs:int"/></xs:sequence>
+          <xs:attribute name="y" type="xs:token"/></xs:restriction></xs:complexContent>
+        </xs:complexType>
+        <xs:complexType name="Wide"><xs:complexContent><xs:extension base="Narrow">
+          <xs:sequence><xs:element name="d" type="xs:int"/></xs:sequence>
+        </xs:extension></xs:complexContent></xs:complexType>
+        <xs:element name="wide" type="Wide"/>)",
+     "wide(0):\n"
+     "  x: string attribute(272) 0/0/0 null\n"
+     "  c: int(48) 0/10/0 null\n"
+     "  y: token attribute(319) 0/0/0 null\n"
+     "  d: int(48) 0/10/0 null\n"},
+
     {"ExtensionOfSimpleTypeGivesFieldNamedAfterRecord",
      R"(<xs:complexType name="T"><xs:complexContent><xs:extension base="xs:string">
           <xs:attribute name="lang" type="xs:language"/></xs:extension></xs:complexContent>
