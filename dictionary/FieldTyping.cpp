@@ -170,25 +170,7 @@ bool TypeResolver::resolveSimpleType(const SimpleTypeDef& simpleType, ZrDType& t
     if (!based)
         return false;
 
-    // Later facets override earlier ones: enumeration length beats the length facets
-    // and the limits; the pattern's precision beats the limits and the precision facet.
-    if (!simpleType.length.empty())
-        type.Length(long(facetNumber(simpleType.length)));
-    else if (!simpleType.maxLength.empty())
-        type.Length(long(facetNumber(simpleType.maxLength)));
-    if (!simpleType.scale.empty())
-        type.DecimalPlaces(
-            short(std::clamp<int64_t>(facetNumber(simpleType.scale), SHRT_MIN, SHRT_MAX)));
-    if (!simpleType.precision.empty())
-        type.Precision(long(facetNumber(simpleType.precision)));
-    if (!simpleType.minInclusive.empty() || !simpleType.maxInclusive.empty() ||
-        !simpleType.minExclusive.empty() || !simpleType.maxExclusive.empty())
-        dtLimits(type, simpleType.minInclusive.c_str(), simpleType.maxInclusive.c_str(),
-                 simpleType.minExclusive.c_str(), simpleType.maxExclusive.c_str());
-    if (!simpleType.pattern.empty())
-        dtPattern(type, simpleType.pattern.c_str());
-    if (simpleType.maxEnumLength != 0)
-        type.Length(simpleType.maxEnumLength);
+    applyFacets(simpleType, type);
     return true;
 }
 
@@ -230,6 +212,28 @@ bool TypeResolver::resolveUnion(const SimpleTypeDef& simpleType, ZrDType& type) 
     type.Precision(allPrecision ? precision : 0);
     type.DecimalPlaces(allDecimals ? decimals : 0);
     return true;
+}
+
+void applyFacets(const SimpleTypeDef& simpleType, ZrDType& type) {
+    // Later facets override earlier ones: enumeration length beats the length facets
+    // and the limits; the pattern's precision beats the limits and the precision facet.
+    if (!simpleType.length.empty())
+        type.Length(long(facetNumber(simpleType.length)));
+    else if (!simpleType.maxLength.empty())
+        type.Length(long(facetNumber(simpleType.maxLength)));
+    if (!simpleType.scale.empty())
+        type.DecimalPlaces(
+            short(std::clamp<int64_t>(facetNumber(simpleType.scale), SHRT_MIN, SHRT_MAX)));
+    if (!simpleType.precision.empty())
+        type.Precision(long(facetNumber(simpleType.precision)));
+    if (!simpleType.minInclusive.empty() || !simpleType.maxInclusive.empty() ||
+        !simpleType.minExclusive.empty() || !simpleType.maxExclusive.empty())
+        dtLimits(type, simpleType.minInclusive.c_str(), simpleType.maxInclusive.c_str(),
+                 simpleType.minExclusive.c_str(), simpleType.maxExclusive.c_str());
+    if (!simpleType.pattern.empty())
+        dtPattern(type, simpleType.pattern.c_str());
+    if (simpleType.maxEnumLength != 0)
+        type.Length(simpleType.maxEnumLength);
 }
 
 void dtLimits(ZrDType& type, const char16_t* minInclusive, const char16_t* maxInclusive,

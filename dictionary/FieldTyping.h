@@ -57,6 +57,8 @@ class TypeResolver {
     std::vector<bool> explained_;
 };
 
+// Narrows `type` by the facets of `simpleType`, as a restriction of it does.
+void applyFacets(const SimpleTypeDef& simpleType, ZrDType& type);
 // Narrows a numeric type to the digits of its range facets.
 void dtLimits(ZrDType& type, const char16_t* minInclusive, const char16_t* maxInclusive,
               const char16_t* minExclusive, const char16_t* maxExclusive);

@@ -107,6 +107,14 @@ class RestrictionsAside {
     std::vector<const ComplexTypeDef*> saved_;
 };
 
+// Whether a type has any of the facets that shape a field's data type.
+bool narrowsText(const SimpleTypeDef& type) {
+    return !type.length.empty() || !type.maxLength.empty() || !type.scale.empty() ||
+           !type.precision.empty() || !type.minInclusive.empty() || !type.maxInclusive.empty() ||
+           !type.minExclusive.empty() || !type.maxExclusive.empty() || !type.pattern.empty() ||
+           type.maxEnumLength != 0;
+}
+
 ZrWString generatedName(int32_t number) {
     ZrWString name(u"anon");
     for (char c : std::to_string(number))
@@ -237,7 +245,8 @@ bool RecordBuilder::addDerivedContent(const ComplexTypeDef& type, const ZrWStrin
 
 // The text of a simple-content type becomes one field named after the record, typed
 // by a simple type of its own: the complex type's base and facets under a fresh
-// generated name, which messages show.
+// generated name, which messages show. Restrictions of the type further along the
+// record's base chain narrow the text in turn, nearest first.
 bool RecordBuilder::addSimpleContentField(const ComplexTypeDef& type, const ZrWString& recordName,
                                           ZrRecord* record) {
     if (!takeBuildStep(record->name.c_str()))
@@ -251,6 +260,10 @@ bool RecordBuilder::addSimpleContentField(const ComplexTypeDef& type, const ZrWS
     if (!resolver.typeOfSimpleType(text, dataType)) {
         logLookupFailure(text.name.view(), {}, field);
         return false;
+    }
+    for (auto it = restrictingTypes.rbegin(); it != restrictingTypes.rend(); ++it) {
+        if ((*it)->simpleContent && narrowsText(**it))
+            applyFacets(**it, dataType);
     }
     newSimpleField(declaration, dataType, std::move(field), record);
     return true;

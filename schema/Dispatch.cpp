@@ -211,8 +211,11 @@ void SchemaReader::doElementTag(xercesc::AttributeList& attrs) { doElement(attrs
 
 void SchemaReader::doAttributeTag(xercesc::AttributeList& attrs) { doElement(attrs, true); }
 
+// A facet of a simple-content restriction, outside any simple type of its own,
+// narrows the complex type's text: its base and facets make the text field's type.
 void SchemaReader::doFacetTag(xercesc::AttributeList& attrs) {
-    doFacet(attrs, currentSimpleType, tagLocal.data());
+    const bool textFacet = typeTarget == &currentComplexType && currentComplexType.simpleContent;
+    doFacet(attrs, textFacet ? currentComplexType : currentSimpleType, tagLocal.data());
 }
 
 void SchemaReader::doSimpleContent(xercesc::AttributeList&) {

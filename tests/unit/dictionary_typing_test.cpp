@@ -468,6 +468,51 @@ const SchemaTypingCase kSchemaTyping[] = {
      "  month: int(48) 2/2/0 null\n"
      "  small: int(48) 2/2/0 null\n"},
 
+    // The facets narrow the text of the restricting type only.
+    {"SimpleContentRestrictionFacetsNarrowTheText",
+     R"(<xs:simpleType name="code"><xs:restriction base="xs:string">
+          <xs:maxLength value="10"/></xs:restriction></xs:simpleType>
+        <xs:complexType name="Short"><xs:simpleContent><xs:restriction base="code">
+          <xs:maxLength value="2"/></xs:restriction></xs:simpleContent></xs:complexType>
+        <xs:complexType name="Kind"><xs:simpleContent><xs:restriction base="xs:string">
+          <xs:enumeration value="small"/><xs:enumeration value="medium"/>
+        </xs:restriction></xs:simpleContent></xs:complexType>
+        <xs:complexType name="Amount"><xs:simpleContent><xs:extension base="code">
+          <xs:attribute name="cur" type="xs:string"/></xs:extension></xs:simpleContent>
+        </xs:complexType>
+        <xs:complexType name="Small"><xs:simpleContent><xs:restriction base="Amount">
+          <xs:maxLength value="5"/></xs:restriction></xs:simpleContent></xs:complexType>
+        <xs:complexType name="Tiny"><xs:simpleContent><xs:restriction base="Small">
+          <xs:maxLength value="3"/></xs:restriction></xs:simpleContent></xs:complexType>
+        <xs:element name="r"><xs:complexType><xs:sequence>
+          <xs:element name="short" type="Short"/>
+          <xs:element name="kind" type="Kind"/>
+          <xs:element name="long" type="code"/>
+          <xs:element name="amount" type="Amount"/>
+          <xs:element name="small" type="Small"/>
+          <xs:element name="tiny" type="Tiny"/>
+        </xs:sequence></xs:complexType></xs:element>)",
+     "r(0):\n"
+     "  short: Record(2) 0/0/0 notnull\n"
+     "  kind: Record(2) 0/0/0 notnull\n"
+     "  long: string(16) 10/0/0 null\n"
+     "  amount: Record(2) 0/0/0 notnull\n"
+     "  small: Record(2) 0/0/0 notnull\n"
+     "  tiny: Record(2) 0/0/0 notnull\n"
+     "short(0):\n"
+     "  short: string(16) 2/0/0 null\n"
+     "kind(0):\n"
+     "  kind: string(16) 6/0/0 null\n"
+     "amount(0):\n"
+     "  amount: string(16) 10/0/0 null\n"
+     "  cur: string attribute(272) 0/0/0 null\n"
+     "small(0):\n"
+     "  small: string(16) 5/0/0 null\n"
+     "  cur: string attribute(272) 0/0/0 null\n"
+     "tiny(0):\n"
+     "  tiny: string(16) 3/0/0 null\n"
+     "  cur: string attribute(272) 0/0/0 null\n"},
+
     // A declaration's own anonymous type is its type, whatever the schema names its
     // types: here the generated names would be anon0 (r's type) and anon1.
     {"SchemaNamesDoNotCaptureAnonymousTypes",

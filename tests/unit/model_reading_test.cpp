@@ -237,12 +237,12 @@ const ModelCase kModelCases[] = {
      "simpleType anon1 base={xs}string maxLength=5\n"
      "simpleType R base=anon1 maxLength=3\n",
      ""},
-    {"FacetsOfComplexContentRestrictionStayOffTheType", "",
+    {"FacetsOfSimpleContentRestrictionGoToTheType", "",
      R"(<xs:simpleType name="S"><xs:restriction base="xs:string"><xs:maxLength value="4"/>
         </xs:restriction></xs:simpleType>
         <xs:complexType name="C"><xs:simpleContent><xs:restriction base="Base">
           <xs:maxLength value="8"/></xs:restriction></xs:simpleContent></xs:complexType>)",
-     "complexType C base=Base simpleContent\n"
+     "complexType C base=Base maxLength=8 simpleContent\n"
      "simpleType S base={xs}string maxLength=4\n",
      ""},
     {"RestrictionAndListBeforeAnyTypeGoNowhere", "",
@@ -297,16 +297,16 @@ TEST(ModelReading, DefaultNamespaceSchemaReadsLikeAPrefixedOne) {
                           "simpleType anon1 base={xs}int maxInclusive=5\n");
 }
 
-// Facets inside a complex type's restriction reach only the working simple type,
-// and the next simple type starts clean.
-TEST(ModelReading, StrayFacetsLandInTheWorkingSimpleType) {
+// Facets inside a complex type's simple-content restriction go to that type and
+// leave the next simple type alone.
+TEST(ModelReading, SimpleContentFacetsLandInTheComplexType) {
     const ReadOutcome read = readSchemaText(
         schemaDoc(R"(<xs:complexType name="C"><xs:simpleContent><xs:restriction base="B">
                        <xs:maxLength value="8"/></xs:restriction></xs:simpleContent>
                      </xs:complexType>
                      <xs:simpleType name="S"><xs:restriction base="xs:string"/></xs:simpleType>)"));
     EXPECT_TRUE(read.ok);
-    EXPECT_EQ(read.model, "complexType C base=B simpleContent\n"
+    EXPECT_EQ(read.model, "complexType C base=B maxLength=8 simpleContent\n"
                           "simpleType S base={xs}string\n");
 }
 
