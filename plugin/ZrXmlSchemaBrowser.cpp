@@ -1,5 +1,6 @@
 #include "ZrXmlSchemaBrowser.h"
 
+#include "ParserConfig.h"
 #include "RecordBuilder.h"
 #include "SchemaCatalog.h"
 #include "SchemaReader.h"
@@ -12,16 +13,12 @@
 #include <xercesc/util/XMLUni.hpp>
 
 ZrXmlSchemaBrowser::ZrXmlSchemaBrowser() {
-    try {
-        xercesc::XMLPlatformUtils::Initialize(xercesc::XMLUni::fgXercescDefaultLocale, nullptr,
-                                              nullptr, nullptr);
-    } catch (const xercesc::XMLException& e) {
+    if (const std::u16string* error = parserLibraryError()) {
         initialised = false;
-        ZrXmlUtils::XMLChToWchar(e.getMessage(), initError, false);
+        initError = *error;
     }
 }
 
-// The parser library stays initialised: other browsers and the host may use it.
 ZrXmlSchemaBrowser::~ZrXmlSchemaBrowser() = default;
 
 bool ZrXmlSchemaBrowser::ReadSchema(const ZrWChar* path, bool qualified) {

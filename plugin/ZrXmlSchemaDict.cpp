@@ -1,23 +1,17 @@
 #include "ZrXmlSchemaDict.h"
 
+#include "ParserConfig.h"
 #include "ZrXmlSchemaBrowser.h"
 #include "zrglob.h"
 
 #include <new>
-#include <xercesc/util/PlatformUtils.hpp>
-#include <xercesc/util/XMLException.hpp>
-#include <xercesc/util/XMLUni.hpp>
-
-XERCES_CPP_NAMESPACE_USE
 
 ZrXmlSchemaDict::ZrXmlSchemaDict(ZrSpoke* spoke) : ZrDictBrowser(spoke, kBuiltinTypeDefinitions) {
-    // The parser library counts initialisations and is never terminated here: a
-    // host may hold several dictionaries, and browsers initialise it again per read.
-    try {
-        XMLPlatformUtils::Initialize(XMLUni::fgXercescDefaultLocale, nullptr, nullptr, nullptr);
-    } catch (const XMLException& e) {
+    // Dictionaries may be made on several threads at once; the library is
+    // initialised once for all of them.
+    if (const std::u16string* error = parserLibraryError()) {
         initialised = false;
-        ZrXmlUtils::XMLChToWchar(e.getMessage(), initError, false);
+        initError = *error;
     }
     // Gives qualifiedRecords its first value from the option's default.
     InitOptions();

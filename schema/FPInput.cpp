@@ -6,7 +6,7 @@
 #include <climits>
 #include <xercesc/util/PlatformUtils.hpp>
 
-XMLSize_t FPInputStream::chunkLimit = 0;
+std::atomic<XMLSize_t> FPInputStream::chunkLimit{0};
 
 FPInputSource::FPInputSource(const ZrWChar* documentPath)
     : xercesc::InputSource(xercesc::XMLPlatformUtils::fgMemoryManager), path(documentPath) {
@@ -41,8 +41,9 @@ XMLFilePos FPInputStream::curPos() const { return position; }
 
 XMLSize_t FPInputStream::readBytes(XMLByte* buffer, XMLSize_t maxToRead) {
     XMLSize_t wanted = maxToRead;
-    if (chunkLimit != 0 && wanted > chunkLimit)
-        wanted = chunkLimit;
+    const XMLSize_t limit = chunkLimit.load(std::memory_order_relaxed);
+    if (limit != 0 && wanted > limit)
+        wanted = limit;
     if (wanted > static_cast<XMLSize_t>(LONG_MAX))
         wanted = static_cast<XMLSize_t>(LONG_MAX);
     const long count = fileProxy.read(reinterpret_cast<char*>(buffer), static_cast<long>(wanted));

@@ -4,6 +4,7 @@
 #include "zrfile.h"
 #include "zrstring.h"
 
+#include <atomic>
 #include <cstdint>
 #include <memory>
 #include <xercesc/sax/InputSource.hpp>
@@ -47,7 +48,7 @@ class FPInputStream : public xercesc::BinInputStream {
 
     // Largest number of bytes one readBytes call hands out; 0 for no limit. Tests
     // lower it to prove the reader does not depend on how the input is chunked.
-    static XMLSize_t chunkLimit;
+    static std::atomic<XMLSize_t> chunkLimit;
 
   private:
     ZrFileProxy fileProxy;

@@ -1,5 +1,6 @@
 #include "ParserConfig.h"
 
+#include <optional>
 #include <string>
 #include <string_view>
 #include <vector>
@@ -10,6 +11,8 @@
 #include <xercesc/sax/SAXException.hpp>
 #include <xercesc/util/PlatformUtils.hpp>
 #include <xercesc/util/SecurityManager.hpp>
+#include <xercesc/util/XMLException.hpp>
+#include <xercesc/util/XMLUni.hpp>
 #include <xercesc/validators/DTD/DTDEntityDecl.hpp>
 
 namespace {
@@ -74,6 +77,21 @@ bool endsEntityName(char16_t c) {
 }
 
 } // namespace
+
+const std::u16string* parserLibraryError() {
+    // A function-local static is initialised once, other threads waiting for it.
+    static const std::optional<std::u16string> error = []() -> std::optional<std::u16string> {
+        try {
+            xercesc::XMLPlatformUtils::Initialize(xercesc::XMLUni::fgXercescDefaultLocale, nullptr,
+                                                  nullptr, nullptr);
+        } catch (const xercesc::XMLException& e) {
+            const XMLCh* message = e.getMessage();
+            return std::u16string(message ? message : u"");
+        }
+        return std::nullopt;
+    }();
+    return error ? &*error : nullptr;
+}
 
 void configureSchemaParser(xercesc::SAXParser& parser) {
     parser.setValidationScheme(xercesc::SAXParser::Val_Never);

@@ -33,6 +33,12 @@ constexpr std::size_t kSchemaEntityValueLimit = 4096;
 // small document from repeating a parameter entity into millions of them.
 constexpr std::size_t kSchemaDtdItemLimit = 10000;
 
+// Initialises the parser library the first time any thread asks, and only then:
+// its initialisation is not safe against concurrent calls. The library is never
+// terminated, since the host or other plug-ins in the process may use it. Null
+// when the library is ready, else the message of its failure.
+const std::u16string* parserLibraryError();
+
 // Configures `parser` for reading schema documents: no validation, no namespace
 // processing (the reader resolves prefixes itself), no external DTD, no default
 // resolution of external entities (nothing is fetched from disk or network

@@ -3,20 +3,17 @@
 #pragma once
 
 #include "FPInput.h"
+#include "ParserConfig.h"
 #include "SchemaReader.h"
 #include "TestSupport.h"
 
 #include <string>
 #include <utility>
-#include <xercesc/util/PlatformUtils.hpp>
 
 namespace zrtest {
 
 // Readers expect the parser library initialised, as the plug-in does before any read.
-inline const bool kParserLibraryReady = [] {
-    xercesc::XMLPlatformUtils::Initialize();
-    return true;
-}();
+inline const bool kParserLibraryReady = parserLibraryError() == nullptr;
 
 // "{ns}local", or "local" without a namespace; the XML Schema namespace prints
 // as "xs". A generated name prints as messages show it, "anonN".
