@@ -65,21 +65,8 @@ void SchemaReader::doRedefine(xercesc::AttributeList& attrs) {
         if (XmlName(attrs.getName(i)) != u"schemaLocation")
             continue;
         ZrXmlUtils::XMLChToWchar(attrs.getValue(i), valueBuffer, false);
-        QueuedDocument redefined;
-        ZrWString refusal;
-        if (!locateDocument(valueBuffer, redefined.path, refusal)) {
-            ZrWString text;
-            wsfmt(text, lgettext(u"Schema: Error: Redefine of '%s' in file %s is not read: %s"),
-                  valueBuffer.c_str(), documentPath_.c_str(), refusal.c_str());
-            reportError(ZR_SEV_ERROR, 4, text);
-            failed = true;
-            continue;
-        }
-        redefined.imported = currentDocument.imported;
-        redefined.ns = currentDocument.ns;
-        redefined.target = bindings->targetNamespace;
-        redefined.redefined = redefinitions;
-        queueDocument(std::move(redefined));
+        queueSchemaDocument(u"Schema: Error: Redefine of '%s' in file %s is not read: %s",
+                            redefinitions);
     }
 }
 

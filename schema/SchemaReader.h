@@ -197,6 +197,8 @@ class SchemaReader : public xercesc::HandlerBase {
     void noteImportFailure(std::u16string_view ns, std::u16string_view location,
                            std::u16string_view reason);
     void resetOpenComponents();
+    void queueSchemaDocument(const XMLCh* format,
+                             std::shared_ptr<const std::vector<RedefinedName>> redefined);
     void logParseStopped(const XMLCh* message);
     // Logs an error of the document being read; an imported document's first error
     // is kept as the reason it could not be read instead.
