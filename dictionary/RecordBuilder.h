@@ -44,6 +44,11 @@ class RecordBuilder {
     const ZrDType* keptFieldType(const ElementDef& declaration) const;
     void logLookupFailure(std::u16string_view local, std::u16string_view ns,
                           const ZrWString& field);
+    // Whether a field of `declaration` may be null, where it is drawn in now.
+    bool fieldNulls(const ElementDef& declaration) const;
+    // Gives `field` the documentation of `declaration`, else of its named type, when
+    // documentation was read.
+    void describe(ZrField& field, const ElementDef& declaration) const;
     // Adds a field of `type` and notes its name.
     void newSimpleField(const ElementDef& declaration, ZrDType type, ZrWString field,
                         ZrRecord* record);
@@ -81,6 +86,9 @@ class RecordBuilder {
     // records around it, whose expansions a nested record may legitimately repeat.
     std::vector<const void*> expansionStack;
     size_t expansionFloor = 0;
+    // Optional group references being drawn into the record under construction: what
+    // they hold may be absent however its own occurrence reads.
+    int drawnOptional = 0;
     // addField and buildRecord calls so far, and their ceiling.
     long buildSteps = 0;
     long buildStepLimit = 0;

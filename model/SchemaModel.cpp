@@ -10,6 +10,10 @@ void ElementDef::clear() {
     groupName.clear();
     groupNs.clear();
     isAttribute = false;
+    optional = false;
+    nillable = false;
+    required = false;
+    documentation.clear();
 }
 
 void SimpleTypeDef::clear() {
@@ -30,6 +34,9 @@ void SimpleTypeDef::clear() {
     encoding.clear();
     period.clear();
     duration.clear();
+    totalDigits.clear();
+    fractionDigits.clear();
+    documentation.clear();
     maxEnumLength = 0;
     isUnion = false;
     memberTypes.clear();
@@ -67,5 +74,7 @@ void SchemaModel::clear() {
     mainElementCount = 0;
     failedImports.clear();
     anonCount = 0;
+    occurrenceRead = false;
+    documentationRead = false;
     names.clear();
 }

@@ -30,9 +30,23 @@ class ElementDef {
     ZrName groupNs;
     bool isAttribute = false;
     bool nullable = true;
+    // Whether "nullable" was written, here or on a declaration around this one; when
+    // occurrence is read, the written flag still decides.
+    bool nullableGiven = false;
+    // Occurrence, read only when the model says so (SchemaModel::occurrenceRead):
+    // the entry may be absent where it stands (its own minOccurs="0", or an optional
+    // compositor or a choice of several branches around it in its definition), it is
+    // nillable="true", or (an attribute) use="required".
+    bool optional = false;
+    bool nillable = false;
+    bool required = false;
+    // The first documentation of the entry's own annotation, white space collapsed;
+    // read only when the model says so (SchemaModel::documentationRead).
+    ZrName documentation;
 
-    // Empties the strings and resets isAttribute; nullable is kept, so a nested
-    // declaration inherits the flag of the one around it.
+    // Empties the strings and resets isAttribute and occurrence; nullable and
+    // nullableGiven are kept, so a nested declaration inherits the flag of the one
+    // around it.
     void clear();
 };
 
@@ -63,6 +77,11 @@ class SimpleTypeDef {
     ZrName encoding;
     ZrName period;
     ZrName duration;
+    // Read only when the reader is asked for digits; "precision" and "scale" win.
+    ZrName totalDigits;
+    ZrName fractionDigits;
+    // The first documentation of the definition's annotation, as for ElementDef.
+    ZrName documentation;
     int32_t maxEnumLength = 0;
     // A union: its values are those of its member types, named or nested, in order.
     bool isUnion = false;
@@ -363,6 +382,10 @@ struct SchemaModel {
     std::vector<ImportFailure> failedImports;
     // Generated names ("anonN") handed out so far.
     int32_t anonCount = 0;
+    // Whether the entries' occurrence and the documentation of declarations and
+    // types were read; without them the entries hold their defaults.
+    bool occurrenceRead = false;
+    bool documentationRead = false;
     // One shared copy of each name, namespace and facet value the model holds.
     ZrNamePool names;
 

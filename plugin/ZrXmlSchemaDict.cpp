@@ -26,7 +26,7 @@ ZrXmlSchemaDict::ZrXmlSchemaDict(ZrSpoke* spoke) : ZrDictBrowser(spoke, kBuiltin
 ZrXmlSchemaDict::ZrXmlSchemaDict(const ZrXmlSchemaDict& other)
     : ZrDictBrowser(other), initialised(other.initialised),
       qualifiedRecords(other.qualifiedRecords), initError(other.initError),
-      catalogFiles(other.catalogFiles) {}
+      catalogFiles(other.catalogFiles), detail(other.detail) {}
 
 ZrXmlSchemaDict& ZrXmlSchemaDict::operator=(const ZrXmlSchemaDict& other) {
     if (this != &other) {
@@ -35,6 +35,7 @@ ZrXmlSchemaDict& ZrXmlSchemaDict::operator=(const ZrXmlSchemaDict& other) {
         qualifiedRecords = other.qualifiedRecords;
         initError = other.initError;
         catalogFiles = other.catalogFiles;
+        detail = other.detail;
     }
     return *this;
 }
@@ -59,6 +60,9 @@ BATCHERR ZrXmlSchemaDict::ReadDictionary(const char* path) {
         SchemaReadOptions options;
         options.qualifiedRecords = qualifiedRecords;
         options.catalogs = catalogFiles;
+        options.decimalDigits = detail.decimalDigits;
+        options.occurrenceNulls = detail.occurrenceNulls;
+        options.fieldDescriptions = detail.fieldDescriptions;
         if (!browser.ReadSchema(widePath.c_str(), options))
             return BE_READ_FAILED;
         // The browser goes away with this scope: its records move rather than copy.

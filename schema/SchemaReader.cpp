@@ -107,6 +107,8 @@ bool SchemaReader::read(const ZrWChar* path) {
     parser->setEntityResolver(this);
 
     model.clear();
+    model.occurrenceRead = detail_.occurrence;
+    model.documentationRead = detail_.documentation;
     bindings = &model.namespaces;
     resetOpenComponents();
     for (ZrName& recent : recentNamespaces)
@@ -212,6 +214,7 @@ void SchemaReader::resetOpenComponents() {
     // A document that failed inside a non-nullable declaration must not hand that flag
     // to the first declaration of the next one.
     currentElement.nullable = true;
+    currentElement.nullableGiven = false;
     complexTypeStack.clear();
     currentComplexType.clear();
     complexDepth = 0;
@@ -223,6 +226,11 @@ void SchemaReader::resetOpenComponents() {
     groupOpenedDefinition.clear();
     redefineDepth = 0;
     recentPrefixesStale = true;
+    compositors.clear();
+    lastOpened = DocOwner::None;
+    docOwner = DocOwner::None;
+    docDepth = 0;
+    docText.clear();
 }
 
 // Formatting the message may itself run out of memory; nothing may leave the read.
