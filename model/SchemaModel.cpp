@@ -10,6 +10,7 @@ void ElementDef::clear() {
     groupName.clear();
     groupNs.clear();
     isAttribute = false;
+    nullableGiven = false;
     optional = false;
     nillable = false;
     required = false;

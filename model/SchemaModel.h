@@ -30,8 +30,8 @@ class ElementDef {
     ZrName groupNs;
     bool isAttribute = false;
     bool nullable = true;
-    // Whether "nullable" was written, here or on a declaration around this one; when
-    // occurrence is read, the written flag still decides.
+    // Whether "nullable" was written on this declaration: when occurrence is read,
+    // the written flag still decides. A flag only inherited does not.
     bool nullableGiven = false;
     // Occurrence, read only when the model says so (SchemaModel::occurrenceRead):
     // the entry may be absent where it stands (its own minOccurs="0", or an optional
@@ -44,9 +44,8 @@ class ElementDef {
     // read only when the model says so (SchemaModel::documentationRead).
     ZrName documentation;
 
-    // Empties the strings and resets isAttribute and occurrence; nullable and
-    // nullableGiven are kept, so a nested declaration inherits the flag of the one
-    // around it.
+    // Empties the strings and resets isAttribute and occurrence; nullable is kept, so
+    // a nested declaration inherits the flag of the one around it.
     void clear();
 };
 

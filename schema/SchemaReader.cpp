@@ -214,7 +214,6 @@ void SchemaReader::resetOpenComponents() {
     // A document that failed inside a non-nullable declaration must not hand that flag
     // to the first declaration of the next one.
     currentElement.nullable = true;
-    currentElement.nullableGiven = false;
     complexTypeStack.clear();
     currentComplexType.clear();
     complexDepth = 0;

@@ -102,8 +102,9 @@ const DetailCase kCases[] = {
 
     // Own minOccurs, nillable, an early "nullable" that still decides, an optional
     // group reference, choices of one and of several branches, optional sequences
-    // around nested ones, a reference, attributes required or not, and a nested
-    // record whose own fields keep their own occurrence.
+    // around nested ones, a reference, attributes required or not, nested records
+    // whose own fields keep their own occurrence, and a "nullable" only inherited,
+    // which occurrence overrides.
     {"NullsFromOccurrence", kNulls,
      R"(<xs:group name="optGroup"><xs:sequence>
           <xs:element name="ga" type="xs:int"/>
@@ -132,6 +133,10 @@ const DetailCase kCases[] = {
           <xs:element name="kid" minOccurs="0"><xs:complexType><xs:sequence>
             <xs:element name="k" type="xs:int"/></xs:sequence></xs:complexType></xs:element>
           <xs:element name="after" type="xs:int"/>
+          <xs:element name="held" nullable="false"><xs:complexType><xs:sequence>
+            <xs:element name="h1" type="xs:int"/>
+            <xs:element name="h2" type="xs:int" minOccurs="0"/>
+          </xs:sequence></xs:complexType></xs:element>
         </xs:sequence>
         <xs:attribute name="must" type="xs:int" use="required"/>
         <xs:attribute name="may" type="xs:int" use="optional"/>
@@ -154,13 +159,17 @@ const DetailCase kCases[] = {
      "  plainTop: string(16) 0/0/0 null\n"
      "  kid: Record(2) 0/0/0 notnull\n"
      "  after: int(48) 0/10/0 null\n"
+     "  held: Record(2) 0/0/0 notnull\n"
      "  must: int attribute(304) 0/10/0 null\n"
      "  may: int attribute(304) 0/10/0 null\n"
      "  globalAttr: int attribute(304) 0/10/0 null\n"
      "inner(0):\n"
      "  x: int(48) 0/10/0 null\n"
      "kid(0):\n"
-     "  k: int(48) 0/10/0 null\n",
+     "  k: int(48) 0/10/0 null\n"
+     "held(0):\n"
+     "  h1: int(48) 0/10/0 notnull\n"
+     "  h2: int(48) 0/10/0 notnull\n",
      "r(0):\n"
      "  req: int(48) 0/10/0 notnull\n"
      "  opt: int(48) 0/10/0 null\n"
@@ -178,13 +187,17 @@ const DetailCase kCases[] = {
      "  plainTop: string(16) 0/0/0 null\n"
      "  kid: Record(2) 0/0/0 null\n"
      "  after: int(48) 0/10/0 notnull\n"
+     "  held: Record(2) 0/0/0 notnull\n"
      "  must: int attribute(304) 0/10/0 notnull\n"
      "  may: int attribute(304) 0/10/0 null\n"
      "  globalAttr: int attribute(304) 0/10/0 notnull\n"
      "inner(0):\n"
      "  x: int(48) 0/10/0 notnull\n"
      "kid(0):\n"
-     "  k: int(48) 0/10/0 notnull\n"},
+     "  k: int(48) 0/10/0 notnull\n"
+     "held(0):\n"
+     "  h1: int(48) 0/10/0 notnull\n"
+     "  h2: int(48) 0/10/0 null\n"},
 
     // Fields drawn from a base type keep the occurrence they have there; an
     // optional sequence of a nested type does not reach the type around it.
