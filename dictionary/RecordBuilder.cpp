@@ -247,7 +247,7 @@ bool RecordBuilder::addField(const ElementDef& declaration, ZrRecord* record) {
             ZrField* field = record->NewField(builtins.recordType(), nested->name);
             if (model.occurrenceRead)
                 field->DataType().Nulls(fieldNulls(declaration));
-            describe(*field, declaration);
+            describe(*field, declaration, true);
             noteField(record, field->FieldName());
         }
         return true;
@@ -342,7 +342,7 @@ void RecordBuilder::newSimpleField(const ElementDef& declaration, ZrDType type, 
     type.Nulls(fieldNulls(declaration));
     // The host's NewField fails only by throwing bad_alloc, so its result needs no test.
     ZrField* added = record->NewField(type, std::move(field));
-    describe(*added, declaration);
+    describe(*added, declaration, false);
     noteField(record, added->FieldName());
 }
 
@@ -356,20 +356,52 @@ bool RecordBuilder::fieldNulls(const ElementDef& declaration) const {
     return declaration.optional || declaration.nillable || drawnOptional != 0;
 }
 
-void RecordBuilder::describe(ZrField& field, const ElementDef& declaration) const {
+void RecordBuilder::describe(ZrField& field, const ElementDef& declaration, bool record) {
     if (!model.documentationRead)
         return;
     const ZrName* text = &declaration.documentation;
     if (text->empty() && !declaration.typeName.empty()) {
         const std::u16string_view name = declaration.typeName.view();
         const std::u16string_view ns = declaration.typeNs.view();
-        if (const ComplexTypeDef* complex = model.findComplexType(name, ns))
-            text = &complex->documentation;
-        else if (const SimpleTypeDef* simple = model.simpleTypes.find(name, ns))
+        if (record) {
+            if (const ComplexTypeDef* complex = model.findComplexType(name, ns))
+                text = &complex->documentation;
+        } else if (const SimpleTypeDef* simple = model.simpleTypes.find(name, ns)) {
             text = &simple->documentation;
+        }
     }
-    if (!text->empty())
-        field.Description(zrUtf16ToUtf8(text->view()).c_str());
+    if (text->empty())
+        return;
+    // As the host's own conversion does, a lone surrogate becomes U+FFFD.
+    // Written into space of three bytes per unit, the most one takes.
+    const std::u16string_view units = text->view();
+    descriptionText.resize(units.size() * 3);
+    char* out = descriptionText.data();
+    for (size_t i = 0; i < units.size(); ++i) {
+        char32_t c = units[i];
+        if (c < 0x80) {
+            *out++ = char(c);
+            continue;
+        }
+        if (c >= 0xD800 && c <= 0xDBFF && i + 1 < units.size() && units[i + 1] >= 0xDC00 &&
+            units[i + 1] <= 0xDFFF)
+            c = 0x10000 + ((c - 0xD800) << 10) + (char32_t(units[++i]) - 0xDC00);
+        else if (c >= 0xD800 && c <= 0xDFFF)
+            c = 0xFFFD;
+        if (c < 0x800) {
+            *out++ = char(0xC0 | (c >> 6));
+        } else if (c < 0x10000) {
+            *out++ = char(0xE0 | (c >> 12));
+            *out++ = char(0x80 | ((c >> 6) & 0x3F));
+        } else {
+            *out++ = char(0xF0 | (c >> 18));
+            *out++ = char(0x80 | ((c >> 12) & 0x3F));
+            *out++ = char(0x80 | ((c >> 6) & 0x3F));
+        }
+        *out++ = char(0x80 | (c & 0x3F));
+    }
+    descriptionText.resize(size_t(out - descriptionText.data()));
+    field.Description(descriptionText.c_str());
 }
 
 // The data type of a field declared with the declaration's type name, before its

@@ -8,6 +8,7 @@
 #include "zrapi.h"
 #include "zrstring.h"
 
+#include <string>
 #include <unordered_map>
 #include <vector>
 
@@ -46,9 +47,9 @@ class RecordBuilder {
                           const ZrWString& field);
     // Whether a field of `declaration` may be null, where it is drawn in now.
     bool fieldNulls(const ElementDef& declaration) const;
-    // Gives `field` the documentation of `declaration`, else of its named type, when
-    // documentation was read.
-    void describe(ZrField& field, const ElementDef& declaration) const;
+    // Gives `field` the documentation of `declaration`, else of its named type (a
+    // complex type when `record`, else a simple one), when documentation was read.
+    void describe(ZrField& field, const ElementDef& declaration, bool record);
     // Adds a field of `type` and notes its name.
     void newSimpleField(const ElementDef& declaration, ZrDType type, ZrWString field,
                         ZrRecord* record);
@@ -89,6 +90,8 @@ class RecordBuilder {
     // Optional group references being drawn into the record under construction: what
     // they hold may be absent however its own occurrence reads.
     int drawnOptional = 0;
+    // The latest description in UTF-8; its space is used again for the next.
+    std::string descriptionText;
     // addField and buildRecord calls so far, and their ceiling.
     long buildSteps = 0;
     long buildStepLimit = 0;

@@ -240,33 +240,40 @@ void SchemaReader::doAnnotation(xercesc::AttributeList&) {
         docOwner = lastOpened;
 }
 
-// The parser may hand one text in several pieces; they are joined before white space
-// is collapsed.
+// White space runs become single blanks as the text arrives, none leading; the parser
+// may hand one text in several pieces, and a run may span two of them.
 void SchemaReader::characters(const XMLCh* chars, XMLSize_t length) {
-    if (docDepth != 0)
-        docText.append(chars, length);
-}
-
-// White space runs become single blanks, trimmed at both ends. A documentation
-// without text leaves the next one to be read.
-void SchemaReader::finishDocumentation() {
-    docDepth = 0;
-    std::u16string collapsed;
-    bool blank = false;
-    for (const char16_t c : docText) {
-        if (c == u' ' || c == u'\t' || c == u'\n' || c == u'\r') {
-            blank = !collapsed.empty();
+    if (docDepth == 0)
+        return;
+    const auto isBlank = [](char16_t c) {
+        return c == u' ' || c == u'\t' || c == u'\n' || c == u'\r';
+    };
+    const XMLCh* const end = chars + length;
+    while (chars != end) {
+        if (isBlank(*chars)) {
+            docBlank = !docText.empty();
+            ++chars;
             continue;
         }
-        if (blank)
-            collapsed += u' ';
-        blank = false;
-        collapsed += c;
+        const XMLCh* word = chars;
+        while (chars != end && !isBlank(*chars))
+            ++chars;
+        if (docBlank)
+            docText += u' ';
+        docBlank = false;
+        docText.append(word, size_t(chars - word));
     }
-    docText.clear();
-    if (collapsed.empty())
+}
+
+// A documentation without text leaves the next one to be read. Descriptions are
+// rarely shared, so they are kept without the name pool.
+void SchemaReader::finishDocumentation() {
+    docDepth = 0;
+    docBlank = false;
+    if (docText.empty())
         return;
-    const ZrName text = model.names.intern(collapsed);
+    const ZrName text(docText);
+    docText.clear();
     if (docOwner == DocOwner::Element)
         currentElement.documentation = text;
     else if (docOwner == DocOwner::ComplexType)

@@ -230,6 +230,7 @@ void SchemaReader::resetOpenComponents() {
     docOwner = DocOwner::None;
     docDepth = 0;
     docText.clear();
+    docBlank = false;
 }
 
 // Formatting the message may itself run out of memory; nothing may leave the read.

@@ -371,6 +371,7 @@ class SchemaReader : public xercesc::HandlerBase {
     DocOwner docOwner = DocOwner::None;
     int32_t docDepth = 0;
     std::u16string docText;
+    bool docBlank = false;
 
     // For each open "group"/"attributeGroup" element: whether its start opened a
     // definition (true) or was a reference (false).

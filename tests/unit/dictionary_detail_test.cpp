@@ -251,7 +251,7 @@ const DetailCase kCases[] = {
         <xs:element name="r"><xs:complexType><xs:sequence><xs:annotation>
           <xs:documentation>Of the sequence</xs:documentation></xs:annotation>
           <xs:element name="own" type="xs:int"><xs:annotation><xs:documentation>Own
-            <b>bold</b> &amp; &#233;t&#233;</xs:documentation></xs:annotation></xs:element>
+            <b>bold</b> &amp; &#233;t&#233; &#x20AC;&#x1F600;</xs:documentation></xs:annotation></xs:element>
           <xs:element name="byType" type="Code"/>
           <xs:element name="both" type="Code"><xs:annotation>
             <xs:documentation>Declared</xs:documentation></xs:annotation></xs:element>
@@ -276,7 +276,7 @@ const DetailCase kCases[] = {
      "party(0):\n"
      "  name: string(16) 0/0/0 null\n",
      "r(0):\n"
-     "  own: int(48) 0/10/0 null \"Own bold & \xc3\xa9t\xc3\xa9\"\n"
+     "  own: int(48) 0/10/0 null \"Own bold & \xc3\xa9t\xc3\xa9 \xe2\x82\xac\xf0\x9f\x98\x80\"\n"
      "  byType: string(16) 0/0/0 null \"A code of three letters\"\n"
      "  both: string(16) 0/0/0 null \"Declared\"\n"
      "  none: int(48) 0/10/0 null\n"
