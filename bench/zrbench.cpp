@@ -263,11 +263,22 @@ struct ReadOutcome {
     long long retainedBytes = 0; // live heap left by the read: the dictionary's records
 };
 
+// Whether reads ask for every field's digits, nulls and description ("DecimalDigits",
+// "OccurrenceNulls", "FieldDescriptions"); set once from the command line.
+bool fieldDetail = false;
+
+void configureRead(ZrXmlSchemaDict& dict, bool qualified) {
+    dict.QualifiedRecords(qualified);
+    dict.Detail().decimalDigits = fieldDetail;
+    dict.Detail().occurrenceNulls = fieldDetail;
+    dict.Detail().fieldDescriptions = fieldDetail;
+}
+
 ReadOutcome measuredRead(const std::string& mainPath, bool qualified) {
     ReadOutcome out;
     MessageSink sink;
     ZrXmlSchemaDict dict(nullptr);
-    dict.QualifiedRecords(qualified);
+    configureRead(dict, qualified);
     heapLive.store(0);
     heapPeak.store(0);
     heapCounting.store(true);
@@ -406,7 +417,7 @@ void timeSet(SetResult& set, bool qualified, int repetitions, CollectingReporter
     auto source = std::make_shared<ZrXmlSchemaDict>(nullptr);
     {
         MessageSink sink;
-        source->QualifiedRecords(qualified);
+        configureRead(*source, qualified);
         source->ReadDictionary(mainPath.c_str());
     }
     configure(benchmark::RegisterBenchmark(hostName.c_str(), [source](benchmark::State& state) {
@@ -424,7 +435,7 @@ void timeSet(SetResult& set, bool qualified, int repetitions, CollectingReporter
                 // A fresh dictionary each time, built outside the timing: the read is
                 // ReadDictionary alone, from an empty record list.
                 ZrXmlSchemaDict dict(nullptr);
-                dict.QualifiedRecords(qualified);
+                configureRead(dict, qualified);
                 const double start = now();
                 const BATCHERR status = dict.ReadDictionary(mainPath.c_str());
                 state.SetIterationTime(now() - start);
@@ -547,6 +558,7 @@ struct Options {
     std::string workDir;
     bool keep = false;
     bool qualified = false;
+    bool fieldDetail = false;
     bool check = false;
     bool wall = false;
     int repetitions = 0;
@@ -555,13 +567,16 @@ struct Options {
 int usage(std::FILE* out = stderr) {
     std::fprintf(
         out, "usage: zrbench [--sizes N[,N...]] [--schema FILE]... [--work-dir DIR] [--keep]\n"
-             "               [--qualified] [--repetitions N] [--wall] [--check] [--benchmark_...]\n"
+             "               [--qualified] [--field-detail] [--repetitions N] [--wall] [--check]\n"
+             "               [--benchmark_...]\n"
              "  --sizes N,...      generated sets to measure (default 1000,10000,100000;\n"
              "                     none when only --schema is given)\n"
              "  --schema FILE      also measure this schema and what it includes (repeatable)\n"
              "  --work-dir DIR     generate into DIR instead of a temporary folder\n"
              "  --keep             keep the generated sets\n"
              "  --qualified        read with QualifiedRecordNames on\n"
+             "  --field-detail     read with DecimalDigits, OccurrenceNulls and\n"
+             "                     FieldDescriptions on\n"
              "  --repetitions N    timed runs per measurement; the fastest counts\n"
              "                     (default 9, 5 or 3 by size)\n"
              "  --wall             time by the elapsed clock instead of the reading thread's\n"
@@ -616,6 +631,8 @@ std::optional<Options> parseOptions(int argc, char** argv) {
             o.keep = true;
         } else if (arg == "--qualified") {
             o.qualified = true;
+        } else if (arg == "--field-detail") {
+            o.fieldDetail = true;
         } else if (arg == "--check") {
             o.check = true;
         } else if (arg == "--wall") {
@@ -687,6 +704,7 @@ int main(int argc, char** argv) {
     if (!options)
         return usage();
     wallClock = options->wall;
+    fieldDetail = options->fieldDetail;
 
     try {
         XMLPlatformUtils::Initialize();

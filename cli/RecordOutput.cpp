@@ -148,16 +148,28 @@ size_t displayWidth(std::string_view text) {
 }
 
 // The columns of a record's table, in order; numbers are right-aligned and the
-// last column is not padded, so lines carry no trailing blanks.
-enum Column { kField, kType, kUsage, kLength, kPrecision, kDecimals, kNulls, kColumns };
+// last column is not padded, so lines carry no trailing blanks. The description
+// column is there only when some field of the record has a description.
+enum Column {
+    kField,
+    kType,
+    kUsage,
+    kLength,
+    kPrecision,
+    kDecimals,
+    kNulls,
+    kDescription,
+    kColumns
+};
 
 constexpr std::string_view kTitles[kColumns] = {"field",     "type",     "usage", "length",
-                                                "precision", "decimals", "nulls"};
+                                                "precision", "decimals", "nulls", "description"};
 
 class RecordTable {
   public:
     void print(OutputBuffer& out, const ZrRecord& record) {
         size_t count = 0;
+        columns_ = kDescription;
         for (size_t c = 0; c < kColumns; ++c)
             widths_[c] = kTitles[c].size();
         for (int i = 0; i < record.FieldCount(); ++i) {
@@ -183,6 +195,10 @@ class RecordTable {
             }
             row.nulls = type.Nulls();
             row.widths[kNulls] = row.nulls ? 3 : 2;
+            row.description = field->Description();
+            row.widths[kDescription] = displayWidth(row.description);
+            if (!row.description.empty())
+                columns_ = kColumns;
             for (size_t c = 0; c < kColumns; ++c)
                 widths_[c] = std::max(widths_[c], row.widths[c]);
         }
@@ -194,7 +210,7 @@ class RecordTable {
         text_ += ", ";
         appendNumber(text_, record.FieldCount());
         text_ += record.FieldCount() == 1 ? " field)\n  " : " fields)\n  ";
-        for (size_t c = 0; c < kColumns; ++c)
+        for (size_t c = 0; c < columns_; ++c)
             cell(c, kTitles[c], kTitles[c].size());
         text_ += '\n';
 
@@ -209,6 +225,11 @@ class RecordTable {
                 at += row.widths[c];
             }
             cell(kNulls, row.nulls ? "yes" : "no", row.widths[kNulls]);
+            if (columns_ == kColumns && !row.description.empty())
+                cell(kDescription, row.description, row.widths[kDescription]);
+            // A field without a description ends in the padding of its nulls cell.
+            while (columns_ == kColumns && text_.back() == ' ')
+                text_.pop_back();
             text_ += '\n';
             // A record of many fields goes out in pieces, not held whole.
             if (text_.size() >= (1 << 16)) {
@@ -226,13 +247,14 @@ class RecordTable {
         std::string_view alias;
         std::string numbers; // usage, length, precision and decimals, one after another
         bool nulls = false;
+        std::string_view description; // the field's own, which outlives the table
         size_t widths[kColumns] = {};
     };
 
     void cell(size_t column, std::string_view text, size_t width) {
         if (column > 0)
             text_ += "  ";
-        const size_t padding = column + 1 < kColumns ? widths_[column] - width : 0;
+        const size_t padding = column + 1 < columns_ ? widths_[column] - width : 0;
         const bool right = column >= kUsage && column <= kDecimals;
         if (right)
             text_.append(padding, ' ');
@@ -243,6 +265,7 @@ class RecordTable {
 
     std::vector<Row> rows_;
     size_t widths_[kColumns] = {};
+    size_t columns_ = kDescription;
     std::string text_;
 };
 

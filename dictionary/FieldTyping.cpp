@@ -221,11 +221,20 @@ void applyFacets(const SimpleTypeDef& simpleType, ZrDType& type) {
         type.Length(long(facetNumber(simpleType.length)));
     else if (!simpleType.maxLength.empty())
         type.Length(long(facetNumber(simpleType.maxLength)));
-    if (!simpleType.scale.empty())
-        type.DecimalPlaces(
-            short(std::clamp<int64_t>(facetNumber(simpleType.scale), SHRT_MIN, SHRT_MAX)));
-    if (!simpleType.precision.empty())
+    // totalDigits and fractionDigits say the same as precision and scale, which win.
+    const ZrName& decimals =
+        simpleType.scale.empty() ? simpleType.fractionDigits : simpleType.scale;
+    if (!decimals.empty())
+        type.DecimalPlaces(short(std::clamp<int64_t>(facetNumber(decimals), SHRT_MIN, SHRT_MAX)));
+    if (!simpleType.precision.empty()) {
         type.Precision(long(facetNumber(simpleType.precision)));
+    } else if (!simpleType.totalDigits.empty()) {
+        // An integer's digits are its length too, as its limits' are.
+        const long digits = long(facetNumber(simpleType.totalDigits));
+        type.Precision(digits);
+        if (!limitsIgnoredFor(type.Usage() & ~256))
+            type.Length(digits);
+    }
     if (!simpleType.minInclusive.empty() || !simpleType.maxInclusive.empty() ||
         !simpleType.minExclusive.empty() || !simpleType.maxExclusive.empty())
         dtLimits(type, simpleType.minInclusive.c_str(), simpleType.maxInclusive.c_str(),

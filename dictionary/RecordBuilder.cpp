@@ -4,6 +4,7 @@
 
 #include <string>
 #include <unordered_set>
+#include <utility>
 
 namespace {
 
@@ -173,6 +174,8 @@ ZrRecord* RecordBuilder::buildRecord(const ElementDef& declaration) {
     open.fieldNames.clear();
 
     bool built = false;
+    // A record's own fields are optional by their own occurrence, wherever it is drawn in.
+    const int outerOptional = std::exchange(drawnOptional, 0);
     const ComplexTypeDef* type =
         model.findComplexType(declaration.typeName.view(), declaration.typeNs.view());
     if (!type) {
@@ -186,6 +189,7 @@ ZrRecord* RecordBuilder::buildRecord(const ElementDef& declaration) {
         for (auto it = type->content.begin(); built && it != type->content.end(); ++it)
             built = addField(*it, record);
     }
+    drawnOptional = outerOptional;
     // A failed record stays in the list with the fields added so far; the read fails.
     --openRecordCount;
     recordWorkList.pop_back();
@@ -309,7 +313,10 @@ bool RecordBuilder::addField(const ElementDef& declaration, ZrRecord* record) {
         // A record met again (a recursive type, or a name shared under unqualified
         // record names) gets one field in its parent, not one per occurrence.
         if (!recordHasField(record, nested->name)) {
-            const ZrField* field = record->NewField(builtins.recordType(), nested->name);
+            ZrField* field = record->NewField(builtins.recordType(), nested->name);
+            if (model.occurrenceRead)
+                field->DataType().Nulls(fieldNulls(declaration));
+            describe(*field, declaration, true);
             noteField(record, field->FieldName());
         }
         return true;
@@ -337,7 +344,21 @@ bool RecordBuilder::addReference(const ElementDef& reference, ZrRecord* record) 
     if (depth.tooDeep(reference.refName.c_str()))
         return false;
     ExpansionScope expanding(expansionStack, target);
-    return addField(*target, record);
+    if (!model.occurrenceRead && !model.documentationRead)
+        return addField(*target, record);
+    // Occurrence belongs to the place of the reference; a "nullable" written on the
+    // declaration still decides, and the reference's own documentation comes first.
+    ElementDef drawn(*target);
+    drawn.optional = reference.optional;
+    drawn.required = reference.required;
+    drawn.nillable = target->nillable || reference.nillable;
+    if (!target->nullableGiven && reference.nullableGiven) {
+        drawn.nullableGiven = true;
+        drawn.nullable = reference.nullable;
+    }
+    if (!reference.documentation.empty())
+        drawn.documentation = reference.documentation;
+    return addField(drawn, record);
 }
 
 bool RecordBuilder::restates(const ComplexTypeDef& restriction, const ElementDef& attribute) const {
@@ -383,11 +404,13 @@ bool RecordBuilder::addGroup(const ElementDef& reference, ZrRecord* record) {
     if (depth.tooDeep(reference.groupName.c_str()))
         return false;
     ExpansionScope expanding(expansionStack, group);
-    for (const ElementDef& entry : group->content) {
-        if (!addField(entry, record))
-            return false;
-    }
-    return true;
+    const int outerOptional = drawnOptional;
+    drawnOptional += reference.optional ? 1 : 0;
+    bool added = true;
+    for (auto it = group->content.begin(); added && it != group->content.end(); ++it)
+        added = addField(*it, record);
+    drawnOptional = outerOptional;
+    return added;
 }
 
 bool RecordBuilder::addSimpleField(const ElementDef& declaration, ZrRecord* record,
@@ -411,10 +434,69 @@ void RecordBuilder::newSimpleField(const ElementDef& declaration, ZrDType type, 
         if (const ZrDType* variant = builtins.TypeByUsage(usage))
             type.Alias(variant->Alias());
     }
-    type.Nulls(declaration.nullable);
+    type.Nulls(fieldNulls(declaration));
     // The host's NewField fails only by throwing bad_alloc, so its result needs no test.
-    const ZrField* added = record->NewField(type, std::move(field));
+    ZrField* added = record->NewField(type, std::move(field));
+    describe(*added, declaration, false);
     noteField(record, added->FieldName());
+}
+
+// An attribute may be null unless required; an element when it may be absent where it
+// stands or where it is drawn in, or is nillable.
+bool RecordBuilder::fieldNulls(const ElementDef& declaration) const {
+    if (!model.occurrenceRead || declaration.nullableGiven)
+        return declaration.nullable;
+    if (declaration.isAttribute)
+        return !declaration.required;
+    return declaration.optional || declaration.nillable || drawnOptional != 0;
+}
+
+void RecordBuilder::describe(ZrField& field, const ElementDef& declaration, bool record) {
+    if (!model.documentationRead)
+        return;
+    const ZrName* text = &declaration.documentation;
+    if (text->empty() && !declaration.typeName.empty()) {
+        const std::u16string_view name = declaration.typeName.view();
+        const std::u16string_view ns = declaration.typeNs.view();
+        if (record) {
+            if (const ComplexTypeDef* complex = model.findComplexType(name, ns))
+                text = &complex->documentation;
+        } else if (const SimpleTypeDef* simple = model.simpleTypes.find(name, ns)) {
+            text = &simple->documentation;
+        }
+    }
+    if (text->empty())
+        return;
+    // As the host's own conversion does, a lone surrogate becomes U+FFFD.
+    // Written into space of three bytes per unit, the most one takes.
+    const std::u16string_view units = text->view();
+    descriptionText.resize(units.size() * 3);
+    char* out = descriptionText.data();
+    for (size_t i = 0; i < units.size(); ++i) {
+        char32_t c = units[i];
+        if (c < 0x80) {
+            *out++ = char(c);
+            continue;
+        }
+        if (c >= 0xD800 && c <= 0xDBFF && i + 1 < units.size() && units[i + 1] >= 0xDC00 &&
+            units[i + 1] <= 0xDFFF)
+            c = 0x10000 + ((c - 0xD800) << 10) + (char32_t(units[++i]) - 0xDC00);
+        else if (c >= 0xD800 && c <= 0xDFFF)
+            c = 0xFFFD;
+        if (c < 0x800) {
+            *out++ = char(0xC0 | (c >> 6));
+        } else if (c < 0x10000) {
+            *out++ = char(0xE0 | (c >> 12));
+            *out++ = char(0x80 | ((c >> 6) & 0x3F));
+        } else {
+            *out++ = char(0xF0 | (c >> 18));
+            *out++ = char(0x80 | ((c >> 12) & 0x3F));
+            *out++ = char(0x80 | ((c >> 6) & 0x3F));
+        }
+        *out++ = char(0x80 | (c & 0x3F));
+    }
+    descriptionText.resize(size_t(out - descriptionText.data()));
+    field.Description(descriptionText.c_str());
 }
 
 // The data type of a field declared with the declaration's type name, before its

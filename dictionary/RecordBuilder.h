@@ -8,6 +8,7 @@
 #include "zrapi.h"
 #include "zrstring.h"
 
+#include <string>
 #include <unordered_map>
 #include <vector>
 
@@ -47,6 +48,11 @@ class RecordBuilder {
     const ZrDType* keptFieldType(const ElementDef& declaration) const;
     void logLookupFailure(std::u16string_view local, std::u16string_view ns,
                           const ZrWString& field);
+    // Whether a field of `declaration` may be null, where it is drawn in now.
+    bool fieldNulls(const ElementDef& declaration) const;
+    // Gives `field` the documentation of `declaration`, else of its named type (a
+    // complex type when `record`, else a simple one), when documentation was read.
+    void describe(ZrField& field, const ElementDef& declaration, bool record);
     // Adds a field of `type` and notes its name.
     void newSimpleField(const ElementDef& declaration, ZrDType type, ZrWString field,
                         ZrRecord* record);
@@ -87,6 +93,11 @@ class RecordBuilder {
     // Restrictions whose bases are being drawn into the record under construction:
     // of those bases only the attributes no restriction here restates are taken.
     std::vector<const ComplexTypeDef*> restrictingTypes;
+    // Optional group references being drawn into the record under construction: what
+    // they hold may be absent however its own occurrence reads.
+    int drawnOptional = 0;
+    // The latest description in UTF-8; its space is used again for the next.
+    std::string descriptionText;
     // addField and buildRecord calls so far, and their ceiling.
     long buildSteps = 0;
     long buildStepLimit = 0;

@@ -11,6 +11,11 @@ void ElementDef::clear() {
     groupNs.clear();
     isAttribute = false;
     prohibited = false;
+    nullableGiven = false;
+    optional = false;
+    nillable = false;
+    required = false;
+    documentation.clear();
 }
 
 void SimpleTypeDef::clear() {
@@ -31,6 +36,9 @@ void SimpleTypeDef::clear() {
     encoding.clear();
     period.clear();
     duration.clear();
+    totalDigits.clear();
+    fractionDigits.clear();
+    documentation.clear();
     maxEnumLength = 0;
     isUnion = false;
     memberTypes.clear();
@@ -69,5 +77,7 @@ void SchemaModel::clear() {
     mainElementCount = 0;
     failedImports.clear();
     anonCount = 0;
+    occurrenceRead = false;
+    documentationRead = false;
     names.clear();
 }

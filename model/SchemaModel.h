@@ -33,9 +33,22 @@ class ElementDef {
     // An attribute declared with use="prohibited": it gives no field, and takes
     // the attribute of that name away from the base of a restriction.
     bool prohibited = false;
+    // Whether "nullable" was written on this declaration: when occurrence is read,
+    // the written flag still decides. A flag only inherited does not.
+    bool nullableGiven = false;
+    // Occurrence, read only when the model says so (SchemaModel::occurrenceRead):
+    // the entry may be absent where it stands (its own minOccurs="0", or an optional
+    // compositor or a choice of several branches around it in its definition), it is
+    // nillable="true", or (an attribute) use="required".
+    bool optional = false;
+    bool nillable = false;
+    bool required = false;
+    // The first documentation of the entry's own annotation, white space collapsed;
+    // read only when the model says so (SchemaModel::documentationRead).
+    ZrName documentation;
 
-    // Empties the strings and resets isAttribute; nullable is kept, so a nested
-    // declaration inherits the flag of the one around it.
+    // Empties the strings and resets isAttribute and occurrence; nullable is kept, so
+    // a nested declaration inherits the flag of the one around it.
     void clear();
 };
 
@@ -66,6 +79,11 @@ class SimpleTypeDef {
     ZrName encoding;
     ZrName period;
     ZrName duration;
+    // Read only when the reader is asked for digits; "precision" and "scale" win.
+    ZrName totalDigits;
+    ZrName fractionDigits;
+    // The first documentation of the definition's annotation, as for ElementDef.
+    ZrName documentation;
     int32_t maxEnumLength = 0;
     // A union: its values are those of its member types, named or nested, in order.
     bool isUnion = false;
@@ -376,6 +394,10 @@ struct SchemaModel {
     std::vector<ImportFailure> failedImports;
     // Generated names ("anonN") handed out so far.
     int32_t anonCount = 0;
+    // Whether the entries' occurrence and the documentation of declarations and
+    // types were read; without them the entries hold their defaults.
+    bool occurrenceRead = false;
+    bool documentationRead = false;
     // One shared copy of each name, namespace and facet value the model holds.
     ZrNamePool names;
 

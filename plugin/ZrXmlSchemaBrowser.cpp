@@ -37,6 +37,11 @@ bool ZrXmlSchemaBrowser::ReadSchema(const ZrWChar* path, const SchemaReadOptions
     SchemaCatalog catalog;
     SchemaReader reader(model);
     reader.setCatalog(&catalog);
+    ReadDetail detail;
+    detail.digits = options.decimalDigits;
+    detail.occurrence = options.occurrenceNulls;
+    detail.documentation = options.fieldDescriptions;
+    reader.setDetail(detail);
     try {
         if (!catalog.load(options.catalogs.view())) {
             model.clear();

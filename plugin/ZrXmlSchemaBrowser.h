@@ -15,6 +15,12 @@ struct SchemaReadOptions {
     bool qualifiedRecords = false;
     // "SchemaCatalog": catalog files separated by ";"; empty for none.
     ZrWString catalogs;
+    // "DecimalDigits": totalDigits and fractionDigits give precision and decimal places.
+    bool decimalDigits = false;
+    // "OccurrenceNulls": a field may be null as its occurrence says.
+    bool occurrenceNulls = false;
+    // "FieldDescriptions": fields carry their declaration's or type's documentation.
+    bool fieldDescriptions = false;
 };
 
 class ZRBXMLS_API ZrXmlSchemaBrowser {

@@ -20,7 +20,7 @@ ZrXmlSchemaDict::ZrXmlSchemaDict(ZrSpoke* spoke) : ZrDictBrowser(spoke, kBuiltin
 ZrXmlSchemaDict::ZrXmlSchemaDict(const ZrXmlSchemaDict& other)
     : ZrDictBrowser(other), initialised(other.initialised),
       qualifiedRecords(other.qualifiedRecords), initError(other.initError),
-      catalogFiles(other.catalogFiles) {}
+      catalogFiles(other.catalogFiles), detail(other.detail) {}
 
 ZrXmlSchemaDict& ZrXmlSchemaDict::operator=(const ZrXmlSchemaDict& other) {
     if (this != &other) {
@@ -29,6 +29,7 @@ ZrXmlSchemaDict& ZrXmlSchemaDict::operator=(const ZrXmlSchemaDict& other) {
         qualifiedRecords = other.qualifiedRecords;
         initError = other.initError;
         catalogFiles = other.catalogFiles;
+        detail = other.detail;
     }
     return *this;
 }
@@ -53,6 +54,9 @@ BATCHERR ZrXmlSchemaDict::ReadDictionary(const char* path) {
         SchemaReadOptions options;
         options.qualifiedRecords = qualifiedRecords;
         options.catalogs = catalogFiles;
+        options.decimalDigits = detail.decimalDigits;
+        options.occurrenceNulls = detail.occurrenceNulls;
+        options.fieldDescriptions = detail.fieldDescriptions;
         if (!browser.ReadSchema(widePath.c_str(), options))
             return BE_READ_FAILED;
         // The browser goes away with this scope: its records move rather than copy.

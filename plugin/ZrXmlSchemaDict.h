@@ -35,6 +35,18 @@ class ZRBXMLS_API ZrXmlSchemaDict : public ZrDictBrowser {
 
     void CatalogFiles(const ZrWString& files) { catalogFiles = files; }
 
+    // The options that ask reads for more of each field: "DecimalDigits",
+    // "OccurrenceNulls", "FieldDescriptions".
+    struct FieldDetail {
+        bool decimalDigits = false;
+        bool occurrenceNulls = false;
+        bool fieldDescriptions = false;
+    };
+
+    const FieldDetail& Detail() const { return detail; }
+
+    FieldDetail& Detail() { return detail; }
+
   private:
     friend class ZrXmlSchemaDictTestAccess;
 
@@ -42,6 +54,7 @@ class ZRBXMLS_API ZrXmlSchemaDict : public ZrDictBrowser {
     bool qualifiedRecords = false;
     ZrWString initError;
     ZrWString catalogFiles;
+    FieldDetail detail;
 };
 
 // A complex number; exported for hosts, unused by the plug-in itself.

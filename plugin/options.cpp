@@ -1,4 +1,6 @@
-// The plug-in's options, "QualifiedRecordNames" and "SchemaCatalog". The host's
+// The plug-in's options, "QualifiedRecordNames", "SchemaCatalog" and the three that
+// ask reads for more of each field: "DecimalDigits", "OccurrenceNulls" and
+// "FieldDescriptions". The host's
 // base class looks options up and calls these callbacks; the values themselves
 // live in the dictionary.
 #include "ZrXmlSchemaDict.h"
@@ -26,6 +28,26 @@ BATCHERR SetQualifiedRecordNames(void* owner, const char* value, bool& changed,
     const bool previous = dict->QualifiedRecords();
     dict->QualifiedRecords(ZrGlob::StrToBool(value, "True.False.true.false"));
     changed = dict->QualifiedRecords() != previous;
+    return BE_OK;
+}
+
+template <bool ZrXmlSchemaDict::FieldDetail::*flag>
+BATCHERR GetDetail(void* owner, ZrString& value, const ZrWChar* /*name*/) {
+    if (!owner)
+        return BE_INVALID_ARGUMENT;
+    value = ZrGlob::BoolToStr(dictionaryOf(owner)->Detail().*flag);
+    return BE_OK;
+}
+
+// As for "QualifiedRecordNames", whatever is not a true word reads as false.
+template <bool ZrXmlSchemaDict::FieldDetail::*flag>
+BATCHERR SetDetail(void* owner, const char* value, bool& changed, const ZrWChar* /*name*/) {
+    if (!owner)
+        return BE_INVALID_ARGUMENT;
+    bool& current = dictionaryOf(owner)->Detail().*flag;
+    const bool previous = current;
+    current = ZrGlob::StrToBool(value, "True.False.true.false");
+    changed = current != previous;
     return BE_OK;
 }
 
@@ -64,10 +86,36 @@ const ZrOptionDef schemaCatalogOption(
     0, "", nullptr, nullptr, nullptr, GetSchemaCatalog, SetSchemaCatalog, nullptr, 0, nullptr,
     nullptr, 0, 0);
 
-const ZrOptionDef* optionDefs[] = {&qualifiedRecordNamesOption, &schemaCatalogOption, nullptr};
+const ZrOptionDef decimalDigitsOption(
+    u"decimaldigits", u"DecimalDigits",
+    u"Take precision and decimal places from the facets totalDigits and fractionDigits "
+    u"where precision and scale are not given",
+    0, "False", nullptr, GetDetail<&ZrXmlSchemaDict::FieldDetail::decimalDigits>,
+    SetDetail<&ZrXmlSchemaDict::FieldDetail::decimalDigits>, nullptr, nullptr, nullptr, 0, nullptr,
+    nullptr, 0, 0);
+
+const ZrOptionDef occurrenceNullsOption(
+    u"occurrencenulls", u"OccurrenceNulls",
+    u"Let a field be null only when it may be absent (minOccurs 0, an optional sequence, "
+    u"choice or group, a choice of several branches), is nillable, or is an attribute "
+    u"not required; a nullable attribute still decides",
+    0, "False", nullptr, GetDetail<&ZrXmlSchemaDict::FieldDetail::occurrenceNulls>,
+    SetDetail<&ZrXmlSchemaDict::FieldDetail::occurrenceNulls>, nullptr, nullptr, nullptr, 0,
+    nullptr, nullptr, 0, 0);
+
+const ZrOptionDef fieldDescriptionsOption(
+    u"fielddescriptions", u"FieldDescriptions",
+    u"Describe each field by the first documentation of its declaration, else of its type", 0,
+    "False", nullptr, GetDetail<&ZrXmlSchemaDict::FieldDetail::fieldDescriptions>,
+    SetDetail<&ZrXmlSchemaDict::FieldDetail::fieldDescriptions>, nullptr, nullptr, nullptr, 0,
+    nullptr, nullptr, 0, 0);
+
+const ZrOptionDef* optionDefs[] = {&qualifiedRecordNamesOption, &schemaCatalogOption,
+                                   &decimalDigitsOption,        &occurrenceNullsOption,
+                                   &fieldDescriptionsOption,    nullptr};
 
 } // namespace
 
-int ZrXmlSchemaDict::OptionDefCount() const { return 2; }
+int ZrXmlSchemaDict::OptionDefCount() const { return 5; }
 
 const ZrOptionDef** ZrXmlSchemaDict::GetOptionDefs() const { return optionDefs; }

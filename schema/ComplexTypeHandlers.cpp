@@ -29,6 +29,8 @@ void SchemaReader::doComplexType(xercesc::AttributeList& attrs) {
     typeTarget = &currentComplexType;
     beginTypeDefinition(attrs, currentComplexType);
     ++complexDepth;
+    lastOpened = DocOwner::ComplexType;
+    openedDepth = elementDepth;
 }
 
 // The start of a simple or complex type: its name and base, a generated name when it
@@ -89,6 +91,7 @@ void SchemaReader::doGroup(xercesc::AttributeList& attrs) {
     ZrName groupNs;
     ZrName refName;
     ZrName refNs;
+    bool optional = detail_.occurrence && optionalHere();
     for (XMLSize_t i = 0; i < attrs.getLength(); ++i) {
         const XmlName attr(attrs.getName(i));
         const XMLCh* value = attrs.getValue(i);
@@ -98,6 +101,8 @@ void SchemaReader::doGroup(xercesc::AttributeList& attrs) {
             parseName(value, false, groupName, groupNs);
         else if (attr == u"ref")
             parseName(value, false, refName, refNs);
+        else if (attr == u"minOccurs" && detail_.occurrence && isZeroOccurs(value))
+            optional = true;
     }
     if (!groupName.empty() && !refName.empty()) {
         ZrGlob::LogMessage(ZR_SEV_NOTICE, 0, "Group %S has both name and ref", groupName.c_str());
@@ -109,6 +114,7 @@ void SchemaReader::doGroup(xercesc::AttributeList& attrs) {
         ElementDef reference;
         reference.groupName = std::move(refName);
         reference.groupNs = std::move(refNs);
+        reference.optional = optional;
         if (complexDepth != 0)
             currentComplexType.content.push_back(std::move(reference));
         else

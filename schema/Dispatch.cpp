@@ -49,11 +49,11 @@ void SchemaReader::startElement(const XMLCh* name, xercesc::AttributeList& attrs
         Action act;
     };
 
-    // First match acts; names not listed (compositors, wildcards)
-    // do nothing and their content is dispatched as usual.
+    // First match acts; names not listed (wildcards) do nothing and their content
+    // is dispatched as usual.
     static constexpr StartAction kStartTable[] = {
         {u"schema", nullptr}, // its attributes and namespace are taken above
-        {u"annotation", &SchemaReader::skipSubtree},
+        {u"annotation", &SchemaReader::doAnnotation},
         {u"notation", &SchemaReader::skipSubtree},
         {u"documentation", &SchemaReader::skipSubtree},
         {u"element", &SchemaReader::doElementTag},
@@ -85,10 +85,19 @@ void SchemaReader::startElement(const XMLCh* name, xercesc::AttributeList& attrs
         {u"period", &SchemaReader::doFacetTag},
         {u"duration", &SchemaReader::doFacetTag},
         {u"enumeration", &SchemaReader::doFacetTag},
+        {u"totalDigits", &SchemaReader::doDigitsFacetTag},
+        {u"fractionDigits", &SchemaReader::doDigitsFacetTag},
+        {u"sequence", &SchemaReader::doCompositor},
+        {u"choice", &SchemaReader::doCompositor},
+        {u"all", &SchemaReader::doCompositor},
     };
     static const TagIndex kStartIndex(kStartTable);
 
     if (skipDepth != 0) {
+        // Only a documentation directly inside the annotation sought is read.
+        if (docOwner != DocOwner::None && skipDepth == 1 && docDepth == 0 &&
+            XmlQualifiedName(name).local == u"documentation")
+            docDepth = 2;
         ++skipDepth;
         return;
     }
@@ -127,6 +136,8 @@ void SchemaReader::startElement(const XMLCh* name, xercesc::AttributeList& attrs
                            ZrWString(local).c_str(), tagNamespace.c_str(), schemaNamespace.c_str());
     }
 
+    if (!compositors.empty())
+        noteBranch();
     if (const StartAction* entry = kStartIndex.find(local); entry && entry->act)
         (this->*entry->act)(attrs);
 }
@@ -145,14 +156,21 @@ void SchemaReader::endElement(const XMLCh* name) {
         {u"simpleType", &SchemaReader::finishSimpleType},
         {u"group", &SchemaReader::finishGroup},
         {u"attributeGroup", &SchemaReader::finishGroup},
+        {u"sequence", &SchemaReader::finishCompositor},
+        {u"choice", &SchemaReader::finishCompositor},
+        {u"all", &SchemaReader::finishCompositor},
     };
     static const TagIndex kEndIndex(kEndTable);
 
     // The end tags of a skipped subtree, the skipping element's and a list's own
     // included, only unwind the count.
     if (skipDepth != 0) {
-        if (--skipDepth == 0)
+        if (docDepth != 0 && skipDepth == docDepth)
+            finishDocumentation();
+        if (--skipDepth == 0) {
+            docOwner = DocOwner::None;
             endScope();
+        }
         return;
     }
     // Only the local part chooses the action; the end tag's namespace plays no part.
@@ -207,6 +225,106 @@ void SchemaReader::endScope() {
 
 void SchemaReader::skipSubtree(xercesc::AttributeList&) { skipDepth = 1; }
 
+// An annotation is skipped whole; while descriptions are read, the first
+// documentation directly inside it is gathered on the way when it belongs to the
+// declaration or type just opened, and that has none yet.
+void SchemaReader::doAnnotation(xercesc::AttributeList&) {
+    skipDepth = 1;
+    if (!detail_.documentation || lastOpened == DocOwner::None || openedDepth != elementDepth - 1)
+        return;
+    const bool described = lastOpened == DocOwner::Element ? !currentElement.documentation.empty()
+                           : lastOpened == DocOwner::ComplexType
+                               ? !currentComplexType.documentation.empty()
+                               : !currentSimpleType.documentation.empty();
+    if (!described)
+        docOwner = lastOpened;
+}
+
+// White space runs become single blanks as the text arrives, none leading; the parser
+// may hand one text in several pieces, and a run may span two of them.
+void SchemaReader::characters(const XMLCh* chars, XMLSize_t length) {
+    if (docDepth == 0)
+        return;
+    const auto isBlank = [](char16_t c) {
+        return c == u' ' || c == u'\t' || c == u'\n' || c == u'\r';
+    };
+    const XMLCh* const end = chars + length;
+    while (chars != end) {
+        if (isBlank(*chars)) {
+            docBlank = !docText.empty();
+            ++chars;
+            continue;
+        }
+        const XMLCh* word = chars;
+        while (chars != end && !isBlank(*chars))
+            ++chars;
+        if (docBlank)
+            docText += u' ';
+        docBlank = false;
+        docText.append(word, size_t(chars - word));
+    }
+}
+
+// A documentation without text leaves the next one to be read. Descriptions are
+// rarely shared, so they are kept without the name pool.
+void SchemaReader::finishDocumentation() {
+    docDepth = 0;
+    docBlank = false;
+    if (docText.empty())
+        return;
+    const ZrName text(docText);
+    docText.clear();
+    if (docOwner == DocOwner::Element)
+        currentElement.documentation = text;
+    else if (docOwner == DocOwner::ComplexType)
+        currentComplexType.documentation = text;
+    else
+        currentSimpleType.documentation = text;
+    docOwner = DocOwner::None;
+}
+
+bool SchemaReader::optionalHere() const {
+    return !compositors.empty() && compositors.back().complexDepth == complexDepth &&
+           compositors.back().optional;
+}
+
+// Every element directly inside a choice but its annotation is a branch.
+void SchemaReader::noteBranch() {
+    OpenCompositor& open = compositors.back();
+    if (open.choice && open.depth == elementDepth - 1 && tagLocal != u"annotation")
+        ++open.branches;
+}
+
+// Sequences, choices and alls matter only for the occurrence of what they hold.
+void SchemaReader::doCompositor(xercesc::AttributeList& attrs) {
+    if (!detail_.occurrence)
+        return;
+    OpenCompositor open;
+    open.depth = elementDepth;
+    open.complexDepth = complexDepth;
+    open.optional = optionalHere();
+    open.choice = tagLocal == u"choice";
+    open.firstEntry = currentComplexType.content.size();
+    for (XMLSize_t i = 0; i < attrs.getLength(); ++i) {
+        if (XmlName(attrs.getName(i)) == u"minOccurs" && isZeroOccurs(attrs.getValue(i)))
+            open.optional = true;
+    }
+    compositors.push_back(open);
+}
+
+// A choice of several branches leaves each of them optional.
+void SchemaReader::finishCompositor() {
+    if (compositors.empty() || compositors.back().depth != elementDepth)
+        return;
+    const OpenCompositor open = compositors.back();
+    compositors.pop_back();
+    if (!open.choice || open.branches < 2 || open.complexDepth != complexDepth)
+        return;
+    std::vector<ElementDef>& content = currentComplexType.content;
+    for (size_t i = open.firstEntry; i < content.size(); ++i)
+        content[i].optional = true;
+}
+
 void SchemaReader::doElementTag(xercesc::AttributeList& attrs) { doElement(attrs, false); }
 
 void SchemaReader::doAttributeTag(xercesc::AttributeList& attrs) { doElement(attrs, true); }
@@ -216,6 +334,11 @@ void SchemaReader::doAttributeTag(xercesc::AttributeList& attrs) { doElement(att
 void SchemaReader::doFacetTag(xercesc::AttributeList& attrs) {
     const bool textFacet = typeTarget == &currentComplexType && currentComplexType.simpleContent;
     doFacet(attrs, textFacet ? currentComplexType : currentSimpleType, tagLocal.data());
+}
+
+void SchemaReader::doDigitsFacetTag(xercesc::AttributeList& attrs) {
+    if (detail_.digits)
+        doFacetTag(attrs);
 }
 
 void SchemaReader::doSimpleContent(xercesc::AttributeList&) {

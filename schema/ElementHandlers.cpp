@@ -10,6 +10,10 @@ void SchemaReader::doElement(xercesc::AttributeList& attrs, bool isAttribute) {
     elementStack.push_back(std::move(currentElement));
     currentElement.clear();
     currentElement.isAttribute = isAttribute;
+    lastOpened = DocOwner::Element;
+    openedDepth = elementDepth;
+    if (detail_.occurrence)
+        currentElement.optional = optionalHere();
 
     for (XMLSize_t i = 0; i < attrs.getLength(); ++i) {
         const XmlName attr(attrs.getName(i));
@@ -23,9 +27,19 @@ void SchemaReader::doElement(xercesc::AttributeList& attrs, bool isAttribute) {
         } else if (attr == u"ref") {
             parseName(value, false, currentElement.refName, currentElement.refNs);
         } else if (attr == u"use") {
-            currentElement.prohibited = isAttribute && xmlText(value) == u"prohibited";
+            const std::u16string_view use = xmlText(value);
+            currentElement.prohibited = isAttribute && use == u"prohibited";
+            currentElement.required = detail_.occurrence && use == u"required";
         } else if (attr == u"nullable") {
             currentElement.nullable = ZrGlob::wcscmpi(value ? value : u"", u"false") != 0;
+            currentElement.nullableGiven = true;
+        } else if (!detail_.occurrence) {
+            continue;
+        } else if (attr == u"minOccurs") {
+            currentElement.optional = currentElement.optional || isZeroOccurs(value);
+        } else if (attr == u"nillable") {
+            const std::u16string_view flag = xmlText(value);
+            currentElement.nillable = flag == u"true" || flag == u"1";
         }
     }
 }

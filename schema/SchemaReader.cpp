@@ -107,6 +107,8 @@ bool SchemaReader::read(const ZrWChar* path) {
     parser->setEntityResolver(this);
 
     model.clear();
+    model.occurrenceRead = detail_.occurrence;
+    model.documentationRead = detail_.documentation;
     bindings = &model.namespaces;
     resetOpenComponents();
     for (ZrName& recent : recentNamespaces)
@@ -223,6 +225,12 @@ void SchemaReader::resetOpenComponents() {
     groupOpenedDefinition.clear();
     redefineDepth = 0;
     recentPrefixesStale = true;
+    compositors.clear();
+    lastOpened = DocOwner::None;
+    docOwner = DocOwner::None;
+    docDepth = 0;
+    docText.clear();
+    docBlank = false;
 }
 
 // Formatting the message may itself run out of memory; nothing may leave the read.

@@ -10,6 +10,7 @@
 #include <deque>
 #include <map>
 #include <memory>
+#include <string>
 #include <string_view>
 #include <type_traits>
 #include <unordered_map>
@@ -25,6 +26,20 @@ static_assert(std::is_same_v<XMLCh, char16_t>, "the host's wide text must be the
 // The parser's text as a view; null reads as the empty text.
 inline std::u16string_view xmlText(const XMLCh* text) {
     return text ? std::u16string_view(text) : std::u16string_view();
+}
+
+// Whether an occurrence count ("minOccurs") is zero: digits, all of them 0, between
+// optional blanks.
+inline bool isZeroOccurs(const XMLCh* text) {
+    std::u16string_view value = xmlText(text);
+    const auto blank = [](char16_t c) {
+        return c == u' ' || c == u'\t' || c == u'\n' || c == u'\r';
+    };
+    while (!value.empty() && blank(value.front()))
+        value.remove_prefix(1);
+    while (!value.empty() && blank(value.back()))
+        value.remove_suffix(1);
+    return !value.empty() && value.find_first_not_of(u'0') == std::u16string_view::npos;
 }
 
 // An attribute name as the parser gives it, compared without measuring it first:
@@ -80,6 +95,17 @@ struct XmlQualifiedName {
 class SchemaCatalog;
 class SchemaParser;
 
+// What a read takes from a schema beyond what every read does. Each costs only when
+// asked for: documentation, for one, is skipped like the rest of an annotation.
+struct ReadDetail {
+    // The facets totalDigits and fractionDigits.
+    bool digits = false;
+    // minOccurs, nillable and use, and the compositors around declarations.
+    bool occurrence = false;
+    // The first documentation of each declaration's and type's annotation.
+    bool documentation = false;
+};
+
 class SchemaReader : public xercesc::HandlerBase {
   public:
     // Fills `model`, which must outlive the reader.
@@ -103,12 +129,16 @@ class SchemaReader : public xercesc::HandlerBase {
     // are looked up; null for none. It must outlive the reads.
     void setCatalog(const SchemaCatalog* catalog) { catalog_ = catalog; }
 
+    // What the next reads take beyond what every read does.
+    void setDetail(const ReadDetail& detail) { detail_ = detail; }
+
     // Whether the document being read has failed so far.
     bool hasFailed() const { return failed; }
 
     // SAX callbacks.
     void startElement(const XMLCh* name, xercesc::AttributeList& attrs) override;
     void endElement(const XMLCh* name) override;
+    void characters(const XMLCh* chars, XMLSize_t length) override;
     void warning(const xercesc::SAXParseException& e) override;
     void error(const xercesc::SAXParseException& e) override;
     void fatalError(const xercesc::SAXParseException& e) override;
@@ -158,9 +188,19 @@ class SchemaReader : public xercesc::HandlerBase {
     void doElementTag(xercesc::AttributeList& attrs);
     void doAttributeTag(xercesc::AttributeList& attrs);
     void doFacetTag(xercesc::AttributeList& attrs);
+    void doDigitsFacetTag(xercesc::AttributeList& attrs);
     void doSimpleContent(xercesc::AttributeList& attrs);
     void doComplexContent(xercesc::AttributeList& attrs);
     void skipSubtree(xercesc::AttributeList& attrs);
+    void doAnnotation(xercesc::AttributeList& attrs);
+    void doCompositor(xercesc::AttributeList& attrs);
+    void finishCompositor();
+    // Whether the compositors open around the working definition's next entry make
+    // it optional.
+    bool optionalHere() const;
+    // Counts a branch of the choice open around the tag being dispatched.
+    void noteBranch();
+    void finishDocumentation();
     void declareInScope(xercesc::AttributeList& attrs);
     // Ends the element at elementDepth, and the namespaces it declared.
     void endScope();
@@ -206,6 +246,7 @@ class SchemaReader : public xercesc::HandlerBase {
 
     SchemaModel& model;
     const SchemaCatalog* catalog_ = nullptr;
+    ReadDetail detail_;
 
     // Parse driver state.
     bool failed = false;
@@ -309,6 +350,30 @@ class SchemaReader : public xercesc::HandlerBase {
     // null-terminated there), and its namespace when a notice names it.
     std::u16string_view tagLocal;
     ZrWString tagNamespace;
+
+    // Open sequences, choices and alls, innermost last, kept while occurrence is read.
+    struct OpenCompositor {
+        int32_t depth = 0;        // elementDepth of its tag
+        int32_t complexDepth = 0; // the definition whose content it orders
+        bool optional = false;    // it, or one around it in that definition, may be absent
+        bool choice = false;
+        int32_t branches = 0;
+        size_t firstEntry = 0; // the definition's content entries from here are inside it
+    };
+
+    std::vector<OpenCompositor> compositors;
+
+    // The component whose annotation's documentation gives its description: the
+    // latest declaration or type opened (at openedDepth); the owner of the annotation
+    // being skipped, while its documentation is sought; the skip depth of the
+    // documentation whose text is gathered (0: none).
+    enum class DocOwner : uint8_t { None, Element, ComplexType, SimpleType };
+    DocOwner lastOpened = DocOwner::None;
+    int32_t openedDepth = 0;
+    DocOwner docOwner = DocOwner::None;
+    int32_t docDepth = 0;
+    std::u16string docText;
+    bool docBlank = false;
 
     // For each open "group"/"attributeGroup" element: whether its start opened a
     // definition (true) or was a reference (false).

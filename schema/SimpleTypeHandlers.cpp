@@ -23,6 +23,8 @@ void SchemaReader::doSimpleType(xercesc::AttributeList& attrs) {
     currentDerivation = Derivation::None;
     typeTarget = &currentSimpleType;
     beginTypeDefinition(attrs, currentSimpleType);
+    lastOpened = DocOwner::SimpleType;
+    openedDepth = elementDepth;
 }
 
 // Stores the simple type. A nested one becomes the base of the restriction or a
@@ -124,6 +126,8 @@ void SchemaReader::doFacet(xercesc::AttributeList& attrs, SimpleTypeDef& type,
         {u"encoding", &SimpleTypeDef::encoding},
         {u"period", &SimpleTypeDef::period},
         {u"duration", &SimpleTypeDef::duration},
+        {u"totalDigits", &SimpleTypeDef::totalDigits},
+        {u"fractionDigits", &SimpleTypeDef::fractionDigits},
     };
 
     ZrName value;

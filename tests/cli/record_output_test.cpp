@@ -160,6 +160,27 @@ TEST(RecordTables, ColumnsFitTheWidestCellInCodePoints) {
     EXPECT_EQ(none.str(), "(no records)\n");
 }
 
+// Only a record with a described field gets the column; its other fields end at
+// their nulls cell, with no blanks after it.
+TEST(RecordTables, DescriptionColumnWhenAFieldHasOne) {
+    ZrRecordList list;
+    ZrRecord* order = addRecord(list, u"order", {{u"id", kString}, {u"note", kString}});
+    order->GetFieldbyPos(1)->Description("Free text, \xc3\xa9t\xc3\xa9");
+    addRecord(list, u"item", {{u"sku", kString}});
+    std::ostringstream out;
+    printRecordsText(out, all(list));
+    EXPECT_EQ(
+        out.str(),
+        "order (length 0, 2 fields)\n"
+        "  field  type    usage  length  precision  decimals  nulls  description\n"
+        "  id     string     16       0          0         0  no\n"
+        "  note   string     16       0          0         0  no     Free text, \xc3\xa9t\xc3\xa9\n"
+        "\n"
+        "item (length 0, 1 field)\n"
+        "  field  type    usage  length  precision  decimals  nulls\n"
+        "  sku    string     16       0          0         0  no\n");
+}
+
 std::string tree(const ZrRecordList& list, std::vector<const ZrRecord*> roots) {
     std::ostringstream out;
     printRecordTree(out, roots, list);

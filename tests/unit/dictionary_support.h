@@ -11,7 +11,8 @@
 namespace zrtest {
 
 // One line per record, "name(length):", then one indented line per field,
-// "name: alias(usage) length/precision/decimals null|notnull".
+// "name: alias(usage) length/precision/decimals null|notnull", and its description
+// in quotes when it has one.
 inline std::string dumpRecords(const ZrRecordList& records) {
     std::string out;
     for (int r = 0; r < records.Count(); ++r) {
@@ -23,7 +24,10 @@ inline std::string dumpRecords(const ZrRecordList& records) {
             out += "  " + utf8(field->FieldName()) + ": " + type.Alias() + "(" +
                    std::to_string(type.Usage()) + ") " + std::to_string(type.Length()) + "/" +
                    std::to_string(type.Precision()) + "/" + std::to_string(type.DecimalPlaces()) +
-                   (type.Nulls() ? " null" : " notnull") + "\n";
+                   (type.Nulls() ? " null" : " notnull");
+            if (*field->Description())
+                out += std::string(" \"") + field->Description() + "\"";
+            out += "\n";
         }
     }
     return out;
@@ -37,17 +41,24 @@ struct SchemaRead {
 
 // Reads `body` wrapped in a schema element (with `schemaAttrs` on it) through a
 // fresh browser.
-inline SchemaRead readInline(const std::string& body, bool qualified = false,
+inline SchemaRead readInline(const std::string& body, const SchemaReadOptions& options,
                              const std::string& schemaAttrs = "") {
     TempDir dir;
     const std::string path = dir.write("schema.xsd", schemaDoc(body, schemaAttrs));
     ZrXmlSchemaBrowser browser;
     LogCapture log;
     SchemaRead result;
-    result.ok = browser.ReadSchema(wide(path).c_str(), qualified);
+    result.ok = browser.ReadSchema(wide(path).c_str(), options);
     result.records = dumpRecords(browser.Records());
     result.messages = log.lines();
     return result;
+}
+
+inline SchemaRead readInline(const std::string& body, bool qualified = false,
+                             const std::string& schemaAttrs = "") {
+    SchemaReadOptions options;
+    options.qualifiedRecords = qualified;
+    return readInline(body, options, schemaAttrs);
 }
 
 } // namespace zrtest

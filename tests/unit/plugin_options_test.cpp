@@ -1,5 +1,5 @@
-// The plug-in's options, "QualifiedRecordNames" and "SchemaCatalog", through the
-// host's option machinery.
+// The plug-in's options, "QualifiedRecordNames", "SchemaCatalog" and the field
+// detail ones, through the host's option machinery.
 #include "ZrXmlSchemaDict.h"
 
 #include <gtest/gtest.h>
@@ -13,17 +13,27 @@ std::string optionText(const ZrDictBrowser& dict, const char16_t* name) {
     return zrUtf16ToUtf8(value.view());
 }
 
-// Two definitions in a fixed order, shared by every dictionary; the boolean one is
-// served by narrow callbacks, the file list by wide ones. Both start from their
+// Five definitions in a fixed order, shared by every dictionary; the boolean ones
+// are served by narrow callbacks, the file list by wide ones. All start from their
 // defaults.
 TEST(PluginOptions, SharedDefinitionsStartingFromTheirDefaults) {
     ZrXmlSchemaDict dict(nullptr);
-    EXPECT_EQ(dict.OptionDefCount(), 2);
+    EXPECT_EQ(dict.OptionDefCount(), 5);
     const ZrOptionDef** defs = dict.GetOptionDefs();
     ASSERT_NE(defs, nullptr);
-    ASSERT_NE(defs[0], nullptr);
-    ASSERT_NE(defs[1], nullptr);
-    EXPECT_EQ(defs[2], nullptr);
+    for (int i = 0; i < 5; ++i)
+        ASSERT_NE(defs[i], nullptr) << i;
+    EXPECT_EQ(defs[5], nullptr);
+    const char16_t* detailNames[] = {u"DecimalDigits", u"OccurrenceNulls", u"FieldDescriptions"};
+    for (int i = 0; i < 3; ++i) {
+        const ZrOptionDef* def = defs[2 + i];
+        EXPECT_EQ(def->Name().str(), detailNames[i]);
+        EXPECT_STREQ(def->DefaultValue().c_str(), "False");
+        EXPECT_NE(def->Getter(), nullptr);
+        EXPECT_NE(def->Setter(), nullptr);
+        EXPECT_FALSE(def->Description().empty());
+        EXPECT_EQ(optionText(dict, detailNames[i]), "False");
+    }
     EXPECT_EQ(defs[1]->Key().str(), u"schemacatalog");
     EXPECT_EQ(defs[1]->Name().str(), u"SchemaCatalog");
     EXPECT_STREQ(defs[1]->DefaultValue().c_str(), "");
@@ -62,6 +72,23 @@ TEST(PluginOptions, SetOptionInterpretsTheText) {
         EXPECT_EQ(dict.SetOption(c.name, c.value), BE_OK);
         EXPECT_EQ(dict.QualifiedRecords(), c.expected) << zrUtf16ToUtf8(c.value);
         EXPECT_EQ(optionText(dict, c.name), c.expected ? "True" : "False");
+    }
+}
+
+// Each detail option sets its own flag and no other.
+TEST(PluginOptions, DetailOptionsSetTheirOwnFlag) {
+    const char16_t* names[] = {u"decimaldigits", u"OccurrenceNulls", u"FIELDDESCRIPTIONS"};
+    for (int i = 0; i < 3; ++i) {
+        ZrXmlSchemaDict dict(nullptr);
+        EXPECT_EQ(dict.SetOption(names[i], u"True"), BE_OK);
+        const ZrXmlSchemaDict::FieldDetail& detail = dict.Detail();
+        EXPECT_EQ(detail.decimalDigits, i == 0) << i;
+        EXPECT_EQ(detail.occurrenceNulls, i == 1) << i;
+        EXPECT_EQ(detail.fieldDescriptions, i == 2) << i;
+        EXPECT_EQ(optionText(dict, names[i]), "True");
+        // A copy of the dictionary keeps the flags for its own reads.
+        ZrXmlSchemaDict copy(dict);
+        EXPECT_EQ(optionText(copy, names[i]), "True");
     }
 }
 
