@@ -257,6 +257,12 @@ bool RecordBuilder::addSimpleContentField(const ComplexTypeDef& type, const ZrWS
         return false;
     SimpleTypeDef text(static_cast<const SimpleTypeDef&>(type));
     text.name = generatedName(anonCounter++).view();
+    // A complex base cannot type text; the restriction's own simple type does.
+    if (!type.contentType.name.empty() &&
+        model.findComplexType(type.baseName.view(), type.baseNs.view())) {
+        text.baseName = type.contentType.name;
+        text.baseNs = type.contentType.ns;
+    }
     ElementDef declaration;
     declaration.name = recordName.view();
     ZrWString field = qualifiedName(declaration.nameNs, declaration.name, false);

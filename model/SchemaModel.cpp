@@ -49,6 +49,7 @@ void ComplexTypeDef::clear() {
     isGroup = false;
     simpleContent = false;
     restriction = false;
+    contentType = TypeRef();
     SimpleTypeDef::clear();
 }
 

@@ -109,6 +109,9 @@ class ComplexTypeDef : public SimpleTypeDef {
     // Derived from its base by restriction: the content restates what it keeps of
     // the base, so only the base's attributes that it does not restate are drawn in.
     bool restriction = false;
+    // The simple type a simple-content restriction gives its text, when it names one
+    // of its own.
+    TypeRef contentType;
 
     ComplexTypeDef() = default;
     ComplexTypeDef(const ComplexTypeDef&) = default;

@@ -26,6 +26,7 @@ void SchemaReader::doComplexType(xercesc::AttributeList& attrs) {
     if (tooDeep())
         return;
     saveComplexType(currentComplexType, complexTypeStack);
+    complexElementDepths.push_back(elementStack.size());
     typeTarget = &currentComplexType;
     beginTypeDefinition(attrs, currentComplexType);
     ++complexDepth;
@@ -67,6 +68,7 @@ void SchemaReader::finishComplexType() {
     model.complexTypes.push_back(std::move(currentComplexType));
     currentComplexType = std::move(complexTypeStack.back());
     complexTypeStack.pop_back();
+    complexElementDepths.pop_back();
     --complexDepth;
     typeTarget = &currentComplexType;
 }
@@ -128,6 +130,7 @@ void SchemaReader::doGroup(xercesc::AttributeList& attrs) {
     if (elementStack.empty() && complexDepth == 0 && simpleDepth == 0)
         nameDefinition(groupName, groupNs, true);
     saveComplexType(currentComplexType, complexTypeStack);
+    complexElementDepths.push_back(elementStack.size());
     currentComplexType.name = std::move(groupName);
     currentComplexType.nameNs = std::move(groupNs);
     currentComplexType.isGroup = true;
@@ -149,5 +152,6 @@ void SchemaReader::finishGroup() {
     model.complexTypes.push_back(std::move(currentComplexType));
     currentComplexType = std::move(complexTypeStack.back());
     complexTypeStack.pop_back();
+    complexElementDepths.pop_back();
     --complexDepth;
 }

@@ -221,6 +221,8 @@ void SchemaReader::resetOpenComponents() {
     currentDerivation = Derivation::None;
     simpleTypeStack.clear();
     simpleDepth = 0;
+    complexElementDepths.clear();
+    typesContent = false;
     typeTarget = nullptr;
     groupOpenedDefinition.clear();
     redefineDepth = 0;

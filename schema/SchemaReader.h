@@ -287,6 +287,10 @@ class SchemaReader : public xercesc::HandlerBase {
 
     std::vector<OpenSimpleType> simpleTypeStack;
     int32_t simpleDepth = 0;
+    // The declarations open when each saved complex type or group started, and
+    // whether the outermost open simple type types the working complex type's text.
+    std::vector<size_t> complexElementDepths;
+    bool typesContent = false;
 
     // The latest answers of namespaceOfPrefix; the URIs live in the table's nodes.
     struct RecentPrefix {

@@ -16,8 +16,15 @@ bool isXmlSpace(char16_t c) { return c == u' ' || c == u'\t' || c == u'\n' || c 
 void SchemaReader::doSimpleType(xercesc::AttributeList& attrs) {
     if (tooDeep())
         return;
-    if (simpleDepth != 0)
+    if (simpleDepth != 0) {
         simpleTypeStack.push_back({std::move(currentSimpleType), currentDerivation});
+    } else {
+        // A simple type standing directly in a simple-content restriction types the
+        // complex type's text.
+        typesContent = typeTarget == &currentComplexType && currentComplexType.simpleContent &&
+                       currentComplexType.restriction && !complexElementDepths.empty() &&
+                       complexElementDepths.back() == elementStack.size();
+    }
     ++simpleDepth;
     currentSimpleType.clear();
     currentDerivation = Derivation::None;
@@ -35,6 +42,9 @@ void SchemaReader::finishSimpleType() {
     model.simpleTypes.push_back(currentSimpleType);
     if (simpleDepth == 0 || --simpleDepth == 0) {
         typeTarget = &currentComplexType;
+        if (typesContent)
+            currentComplexType.contentType = {currentSimpleType.name, currentSimpleType.nameNs};
+        typesContent = false;
         return;
     }
     TypeRef inner{currentSimpleType.name, currentSimpleType.nameNs};

@@ -585,6 +585,21 @@ const RecordCase kCases[] = {
      "  x: int(48) 0/10/0 null\n",
      "4 0 Circular reference to group g\n", false},
 
+    // A simple-content restriction of a complex base without text types its text by
+    // the simple type it defines.
+    {"SimpleContentRestrictionOfAComplexBaseTypesItsTextByItsOwnType",
+     R"(<xs:complexType name="Base"><xs:complexContent><xs:extension base="xs:anyType">
+          <xs:attribute name="mask" type="xs:boolean"/></xs:extension></xs:complexContent>
+        </xs:complexType>
+        <xs:complexType name="Str"><xs:simpleContent><xs:restriction base="Base">
+          <xs:simpleType><xs:restriction base="xs:string"><xs:maxLength value="4"/>
+          </xs:restriction></xs:simpleType>
+          <xs:attribute name="kind"><xs:simpleType><xs:restriction base="xs:int"/>
+          </xs:simpleType></xs:attribute></xs:restriction></xs:simpleContent></xs:complexType>
+        <xs:element name="r" type="Str"/>)",
+     "r(0):\n"
+     "  r: string(16) 4/0/0 null\n"
+     "  kind: int attribute(304) 0/10/0 null\n"},
     // Types and groups have names of their own: a group reference finds no type.
     {"GroupReferenceFindsNoTypeOfThatName",
      R"(<xs:complexType name="T"><xs:sequence><xs:group ref="T"/></xs:sequence></xs:complexType>
