@@ -275,7 +275,7 @@ bool RecordBuilder::addSimpleContentField(const ComplexTypeDef& type, const ZrWS
         if ((*it)->simpleContent && narrowsText(**it))
             applyFacets(**it, dataType);
     }
-    newSimpleField(declaration, dataType, std::move(field), record);
+    newSimpleField(declaration, dataType, std::move(field), record, Description());
     return true;
 }
 
@@ -311,8 +311,11 @@ bool RecordBuilder::addField(const ElementDef& declaration, ZrRecord* record) {
 
     // Only names that found no complex type are kept as field types, so a kept one
     // spares the complex-type lookup.
-    const ZrDType* kept = keptFieldType(declaration);
-    if (!kept && model.findComplexType(declaration.typeName.view(), declaration.typeNs.view())) {
+    const FieldTypeEntry* kept = keptFieldType(declaration);
+    const ComplexTypeDef* complex =
+        kept ? nullptr
+             : model.findComplexType(declaration.typeName.view(), declaration.typeNs.view());
+    if (complex) {
         const ZrRecord* nested = buildRecord(declaration);
         if (!nested)
             return false;
@@ -322,7 +325,7 @@ bool RecordBuilder::addField(const ElementDef& declaration, ZrRecord* record) {
             ZrField* field = record->NewField(builtins.recordType(), nested->name);
             if (model.occurrenceRead)
                 field->DataType().Nulls(fieldNulls(declaration));
-            describe(*field, declaration, true);
+            describe(*field, declaration, complex->documentation);
             noteField(record, field->FieldName());
         }
         return true;
@@ -362,7 +365,7 @@ bool RecordBuilder::addReference(const ElementDef& reference, ZrRecord* record) 
         drawn.nullableGiven = true;
         drawn.nullable = reference.nullable;
     }
-    if (!reference.documentation.empty())
+    if (reference.documentation)
         drawn.documentation = reference.documentation;
     return addField(drawn, record);
 }
@@ -420,19 +423,16 @@ bool RecordBuilder::addGroup(const ElementDef& reference, ZrRecord* record) {
 }
 
 bool RecordBuilder::addSimpleField(const ElementDef& declaration, ZrRecord* record,
-                                   const ZrDType* kept) {
+                                   const FieldTypeEntry* kept) {
     ZrWString field = qualifiedName(declaration.nameNs, declaration.name, false);
-    ZrDType type;
-    if (kept)
-        type = *kept;
-    else if (!fieldType(declaration, field, type))
+    if (!kept && !(kept = fieldType(declaration, field)))
         return false;
-    newSimpleField(declaration, type, std::move(field), record);
+    newSimpleField(declaration, kept->type, std::move(field), record, kept->description);
     return true;
 }
 
 void RecordBuilder::newSimpleField(const ElementDef& declaration, ZrDType type, ZrWString field,
-                                   ZrRecord* record) {
+                                   ZrRecord* record, const Description& typeText) {
     if (declaration.isAttribute) {
         // Only usage and alias change; a type without an attribute variant keeps its alias.
         const short usage = short(type.Usage() + 256);
@@ -443,7 +443,7 @@ void RecordBuilder::newSimpleField(const ElementDef& declaration, ZrDType type, 
     type.Nulls(fieldNulls(declaration));
     // The host's NewField fails only by throwing bad_alloc, so its result needs no test.
     ZrField* added = record->NewField(type, std::move(field));
-    describe(*added, declaration, false);
+    describe(*added, declaration, typeText);
     noteField(record, added->FieldName());
 }
 
@@ -457,69 +457,38 @@ bool RecordBuilder::fieldNulls(const ElementDef& declaration) const {
     return declaration.optional || declaration.nillable || drawnOptional != 0;
 }
 
-void RecordBuilder::describe(ZrField& field, const ElementDef& declaration, bool record) {
-    if (!model.documentationRead)
-        return;
-    const ZrName* text = &declaration.documentation;
-    if (text->empty() && !declaration.typeName.empty()) {
-        const std::u16string_view name = declaration.typeName.view();
-        const std::u16string_view ns = declaration.typeNs.view();
-        if (record) {
-            if (const ComplexTypeDef* complex = model.findComplexType(name, ns))
-                text = &complex->documentation;
-        } else if (const SimpleTypeDef* simple = model.simpleTypes.find(name, ns)) {
-            text = &simple->documentation;
-        }
-    }
-    if (text->empty())
-        return;
-    // As the host's own conversion does, a lone surrogate becomes U+FFFD.
-    // Written into space of three bytes per unit, the most one takes.
-    const std::u16string_view units = text->view();
-    descriptionText.resize(units.size() * 3);
-    char* out = descriptionText.data();
-    for (size_t i = 0; i < units.size(); ++i) {
-        char32_t c = units[i];
-        if (c < 0x80) {
-            *out++ = char(c);
-            continue;
-        }
-        if (c >= 0xD800 && c <= 0xDBFF && i + 1 < units.size() && units[i + 1] >= 0xDC00 &&
-            units[i + 1] <= 0xDFFF)
-            c = 0x10000 + ((c - 0xD800) << 10) + (char32_t(units[++i]) - 0xDC00);
-        else if (c >= 0xD800 && c <= 0xDFFF)
-            c = 0xFFFD;
-        if (c < 0x800) {
-            *out++ = char(0xC0 | (c >> 6));
-        } else if (c < 0x10000) {
-            *out++ = char(0xE0 | (c >> 12));
-            *out++ = char(0x80 | ((c >> 6) & 0x3F));
-        } else {
-            *out++ = char(0xF0 | (c >> 18));
-            *out++ = char(0x80 | ((c >> 12) & 0x3F));
-            *out++ = char(0x80 | ((c >> 6) & 0x3F));
-        }
-        *out++ = char(0x80 | (c & 0x3F));
-    }
-    descriptionText.resize(size_t(out - descriptionText.data()));
-    field.Description(descriptionText.c_str());
+void RecordBuilder::describe(ZrField& field, const ElementDef& declaration,
+                             const Description& typeText) {
+    if (declaration.documentation)
+        field.Description(declaration.documentation);
+    else if (typeText)
+        field.Description(typeText);
 }
 
 // The data type of a field declared with the declaration's type name, before its
 // attribute and nullable flags. A type found once is kept: with the model complete,
 // lookups of one name give one answer for the rest of the build. Failures are looked
 // up again, so each says why.
-bool RecordBuilder::fieldType(const ElementDef& declaration, const ZrWString& field,
-                              ZrDType& type) {
+const RecordBuilder::FieldTypeEntry* RecordBuilder::fieldType(const ElementDef& declaration,
+                                                              const ZrWString& field) {
     const std::u16string_view local =
         declaration.typeName.empty() ? u"string" : declaration.typeName.view();
+    ZrDType type;
     if (!resolver.lookupType(local, declaration.typeNs.view(), type)) {
         logLookupFailure(local, declaration.typeNs.view(), field);
-        return false;
+        return nullptr;
     }
-    fieldTypes.emplace(FieldTypeKey{declaration.typeName.identity(), declaration.typeNs.identity()},
-                       FieldTypeEntry{declaration.typeName, declaration.typeNs, type});
-    return true;
+    Description description;
+    if (model.documentationRead && !declaration.typeName.empty()) {
+        if (const SimpleTypeDef* simple = model.simpleTypes.find(local, declaration.typeNs.view()))
+            description = simple->documentation;
+    }
+    return &fieldTypes
+                .emplace(
+                    FieldTypeKey{declaration.typeName.identity(), declaration.typeNs.identity()},
+                    FieldTypeEntry{declaration.typeName, declaration.typeNs, type,
+                                   std::move(description)})
+                .first->second;
 }
 
 // The namespace is shown as it reads back from the type's name written with its
@@ -536,10 +505,11 @@ void RecordBuilder::logLookupFailure(std::u16string_view local, std::u16string_v
     resolver.explainMissing(ns);
 }
 
-const ZrDType* RecordBuilder::keptFieldType(const ElementDef& declaration) const {
+const RecordBuilder::FieldTypeEntry*
+RecordBuilder::keptFieldType(const ElementDef& declaration) const {
     const auto it = fieldTypes.find(
         FieldTypeKey{declaration.typeName.identity(), declaration.typeNs.identity()});
-    return it == fieldTypes.end() ? nullptr : &it->second.type;
+    return it == fieldTypes.end() ? nullptr : &it->second;
 }
 
 ZrWString RecordBuilder::qualifiedName(const ZrName& ns, const ZrName& local,

@@ -8,6 +8,7 @@
 #include "zrapi.h"
 #include "zrstring.h"
 
+#include <memory>
 #include <string>
 #include <unordered_map>
 #include <vector>
@@ -43,19 +44,21 @@ class RecordBuilder {
     bool restates(const ComplexTypeDef& restriction, const ElementDef& attribute) const;
     bool addGroup(const ElementDef& reference, ZrRecord* record);
     // `kept`: the declaration's type as kept from an earlier field, or null.
-    bool addSimpleField(const ElementDef& declaration, ZrRecord* record, const ZrDType* kept);
-    bool fieldType(const ElementDef& declaration, const ZrWString& field, ZrDType& type);
-    const ZrDType* keptFieldType(const ElementDef& declaration) const;
+    struct FieldTypeEntry;
+    bool addSimpleField(const ElementDef& declaration, ZrRecord* record,
+                        const FieldTypeEntry* kept);
+    // The declaration's type found and kept, or null when it cannot be typed.
+    const FieldTypeEntry* fieldType(const ElementDef& declaration, const ZrWString& field);
+    const FieldTypeEntry* keptFieldType(const ElementDef& declaration) const;
     void logLookupFailure(std::u16string_view local, std::u16string_view ns,
                           const ZrWString& field);
     // Whether a field of `declaration` may be null, where it is drawn in now.
     bool fieldNulls(const ElementDef& declaration) const;
-    // Gives `field` the documentation of `declaration`, else of its named type (a
-    // complex type when `record`, else a simple one), when documentation was read.
-    void describe(ZrField& field, const ElementDef& declaration, bool record);
+    // Gives `field` the documentation of `declaration`, else that of its named type.
+    void describe(ZrField& field, const ElementDef& declaration, const Description& typeText);
     // Adds a field of `type` and notes its name.
     void newSimpleField(const ElementDef& declaration, ZrDType type, ZrWString field,
-                        ZrRecord* record);
+                        ZrRecord* record, const Description& typeText);
     ZrWString qualifiedName(const ZrName& ns, const ZrName& local, bool useTargetPrefix) const;
     ZrWString recordName(const ZrWString& qualified) const;
     bool isExpanding(const void* component) const;
@@ -96,8 +99,6 @@ class RecordBuilder {
     // Optional group references being drawn into the record under construction: what
     // they hold may be absent however its own occurrence reads.
     int drawnOptional = 0;
-    // The latest description in UTF-8; its space is used again for the next.
-    std::string descriptionText;
     // addField and buildRecord calls so far, and their ceiling.
     long buildSteps = 0;
     long buildStepLimit = 0;
@@ -137,6 +138,8 @@ class RecordBuilder {
         ZrName name;
         ZrName ns;
         ZrDType type;
+        // The named simple type's documentation, when documentation was read.
+        Description description;
     };
 
     std::unordered_map<FieldTypeKey, FieldTypeEntry, FieldTypeKeyHash> fieldTypes;

@@ -15,7 +15,7 @@ void ElementDef::clear() {
     optional = false;
     nillable = false;
     required = false;
-    documentation.clear();
+    documentation.reset();
 }
 
 void SimpleTypeDef::clear() {
@@ -38,7 +38,7 @@ void SimpleTypeDef::clear() {
     duration.clear();
     totalDigits.clear();
     fractionDigits.clear();
-    documentation.clear();
+    documentation.reset();
     maxEnumLength = 0;
     isUnion = false;
     memberTypes.clear();

@@ -10,10 +10,15 @@
 #include <deque>
 #include <functional>
 #include <map>
+#include <memory>
 #include <string>
 #include <string_view>
 #include <unordered_map>
 #include <vector>
+
+// A description as fields carry it: UTF-8, white space collapsed. One text is shared
+// by every copy of the declaration or type it documents and every field it describes.
+using Description = std::shared_ptr<const std::string>;
 
 // One "element" or "attribute" declaration, a reference to a global element, or a
 // reference to a group. Kind, in the order record building tests it: refName set
@@ -45,7 +50,7 @@ class ElementDef {
     bool required = false;
     // The first documentation of the entry's own annotation, white space collapsed;
     // read only when the model says so (SchemaModel::documentationRead).
-    ZrName documentation;
+    Description documentation;
 
     // Empties the strings and resets isAttribute and occurrence; nullable is kept, so
     // a nested declaration inherits the flag of the one around it.
@@ -83,7 +88,7 @@ class SimpleTypeDef {
     ZrName totalDigits;
     ZrName fractionDigits;
     // The first documentation of the definition's annotation, as for ElementDef.
-    ZrName documentation;
+    Description documentation;
     int32_t maxEnumLength = 0;
     // A union: its values are those of its member types, named or nested, in order.
     bool isUnion = false;

@@ -1,7 +1,10 @@
 #include "SchemaReader.h"
 #include "zrglob.h"
 
+#include <memory>
+#include <string>
 #include <string_view>
+#include <utility>
 #include <vector>
 
 namespace {
@@ -232,54 +235,101 @@ void SchemaReader::doAnnotation(xercesc::AttributeList&) {
     skipDepth = 1;
     if (!detail_.documentation || lastOpened == DocOwner::None || openedDepth != elementDepth - 1)
         return;
-    const bool described = lastOpened == DocOwner::Element ? !currentElement.documentation.empty()
+    const bool described = lastOpened == DocOwner::Element ? bool(currentElement.documentation)
                            : lastOpened == DocOwner::ComplexType
-                               ? !currentComplexType.documentation.empty()
-                               : !currentSimpleType.documentation.empty();
+                               ? bool(currentComplexType.documentation)
+                               : bool(currentSimpleType.documentation);
     if (!described)
         docOwner = lastOpened;
 }
 
-// White space runs become single blanks as the text arrives, none leading; the parser
-// may hand one text in several pieces, and a run may span two of them.
+// White space runs become single blanks as the text arrives, none leading, and the
+// text is written in UTF-8 as fields carry it (a lone surrogate becomes U+FFFD, as the
+// host's own conversion does). The parser may hand one text in several pieces: a run
+// of white space or a surrogate pair may span two of them.
 void SchemaReader::characters(const XMLCh* chars, XMLSize_t length) {
     if (docDepth == 0)
         return;
-    const auto isBlank = [](char16_t c) {
-        return c == u' ' || c == u'\t' || c == u'\n' || c == u'\r';
+    const size_t kept = docText.size();
+    // Three bytes a unit at most, and before the first a blank and a pending lone
+    // high surrogate's replacement.
+    docText.resize(kept + 3 * length + 5);
+    char* const begin = docText.data();
+    char* out = begin + kept;
+    bool blank = docBlank;
+    const auto put = [&](char32_t c) {
+        if (blank && out != begin)
+            *out++ = ' ';
+        blank = false;
+        if (c < 0x80) {
+            *out++ = char(c);
+            return;
+        }
+        if (c < 0x800) {
+            *out++ = char(0xC0 | (c >> 6));
+        } else if (c < 0x10000) {
+            *out++ = char(0xE0 | (c >> 12));
+            *out++ = char(0x80 | ((c >> 6) & 0x3F));
+        } else {
+            *out++ = char(0xF0 | (c >> 18));
+            *out++ = char(0x80 | ((c >> 12) & 0x3F));
+            *out++ = char(0x80 | ((c >> 6) & 0x3F));
+        }
+        *out++ = char(0x80 | (c & 0x3F));
     };
     const XMLCh* const end = chars + length;
-    while (chars != end) {
-        if (isBlank(*chars)) {
-            docBlank = !docText.empty();
-            ++chars;
-            continue;
+    for (; chars != end; ++chars) {
+        // Most text is runs of printable ASCII: those are copied as they stand.
+        if (*chars > u' ' && *chars < 0x80 && docHigh == 0) {
+            if (blank && out != begin)
+                *out++ = ' ';
+            blank = false;
+            do
+                *out++ = char(*chars++);
+            while (chars != end && *chars > u' ' && *chars < 0x80);
+            if (chars == end)
+                break;
         }
-        const XMLCh* word = chars;
-        while (chars != end && !isBlank(*chars))
-            ++chars;
-        if (docBlank)
-            docText += u' ';
-        docBlank = false;
-        docText.append(word, size_t(chars - word));
+        const char32_t c = *chars;
+        if (docHigh != 0) {
+            const char32_t high = std::exchange(docHigh, u'\0');
+            if (c >= 0xDC00 && c <= 0xDFFF) {
+                put(0x10000 + ((high - 0xD800) << 10) + (c - 0xDC00));
+                continue;
+            }
+            put(0xFFFD);
+        }
+        if (c <= u' ' && (c == u' ' || c == u'\t' || c == u'\n' || c == u'\r'))
+            blank = true;
+        else if (c >= 0xD800 && c <= 0xDBFF)
+            docHigh = char16_t(c);
+        else
+            put(c >= 0xDC00 && c <= 0xDFFF ? 0xFFFD : c);
     }
+    docBlank = blank;
+    docText.resize(size_t(out - begin));
 }
 
-// A documentation without text leaves the next one to be read. Descriptions are
-// rarely shared, so they are kept without the name pool.
+// A documentation without text leaves the next one to be read.
 void SchemaReader::finishDocumentation() {
+    if (docHigh != 0) {
+        if (docBlank && !docText.empty())
+            docText += ' ';
+        docText += "\xEF\xBF\xBD";
+        docHigh = 0;
+    }
     docDepth = 0;
     docBlank = false;
     if (docText.empty())
         return;
-    const ZrName text(docText);
+    Description text = std::make_shared<const std::string>(docText);
     docText.clear();
     if (docOwner == DocOwner::Element)
-        currentElement.documentation = text;
+        currentElement.documentation = std::move(text);
     else if (docOwner == DocOwner::ComplexType)
-        currentComplexType.documentation = text;
+        currentComplexType.documentation = std::move(text);
     else
-        currentSimpleType.documentation = text;
+        currentSimpleType.documentation = std::move(text);
     docOwner = DocOwner::None;
 }
 

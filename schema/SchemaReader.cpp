@@ -233,6 +233,7 @@ void SchemaReader::resetOpenComponents() {
     docDepth = 0;
     docText.clear();
     docBlank = false;
+    docHigh = 0;
 }
 
 // Formatting the message may itself run out of memory; nothing may leave the read.

@@ -376,8 +376,11 @@ class SchemaReader : public xercesc::HandlerBase {
     int32_t openedDepth = 0;
     DocOwner docOwner = DocOwner::None;
     int32_t docDepth = 0;
-    std::u16string docText;
+    // The text gathered so far, in UTF-8; a high surrogate whose low half has not
+    // arrived yet.
+    std::string docText;
     bool docBlank = false;
+    char16_t docHigh = 0;
 
     // For each open "group"/"attributeGroup" element: whether its start opened a
     // definition (true) or was a reference (false).

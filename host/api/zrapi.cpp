@@ -14,6 +14,13 @@ ZrField::ZrField(const ZrDType& type) : type_(type) {}
 
 ZrField::~ZrField() = default;
 
+void ZrField::Description(const char* text) {
+    if (text && *text)
+        description_ = std::make_shared<const std::string>(text);
+    else
+        description_.reset();
+}
+
 void ZrField::Print(ZrWString& out) const {
     ZrWString usage;
     wsfmt(usage, u"(%d)", static_cast<int>(type_.Usage()));

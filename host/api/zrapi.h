@@ -7,6 +7,7 @@
 #include "zrtypes.h"
 
 #include <memory>
+#include <string>
 #include <utility>
 #include <vector>
 
@@ -35,8 +36,11 @@ public:
     void Alias(const ZrWString& alias) { alias_ = alias; }
     const ZrWString& Alias() const { return alias_; }
     // A null description sets the empty text.
-    void Description(const char* text) { description_ = text; }
-    const char* Description() const { return description_.c_str(); }
+    void Description(const char* text);
+    // One text often describes many fields (a type's documentation), and records are
+    // copied whole: a shared text is held once, however many fields and copies use it.
+    void Description(std::shared_ptr<const std::string> text) { description_ = std::move(text); }
+    const char* Description() const { return description_ ? description_->c_str() : ""; }
 
     // One line "name alias(usage)" describing the field.
     virtual void Print(ZrWString& out) const;
@@ -58,7 +62,7 @@ private:
     ZrDType type_;
     ZrWString name_;
     ZrWString alias_;
-    ZrString description_;
+    std::shared_ptr<const std::string> description_;
     ZrString picture_;
 };
 
