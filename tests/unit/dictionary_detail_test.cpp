@@ -61,24 +61,12 @@ const DetailCase kCases[] = {
           <xs:element name="scaled" type="Scaled"/>
           <xs:element name="either" type="Either"/>
         </xs:sequence></xs:complexType></xs:element>)",
-     "r(0):\n"
-     "  Amt: Record(2) 0/0/0 notnull\n"
-     "  chained: decimal(20) 0/16/2 null\n"
-     "  narrow: decimal(20) 0/16/2 null\n"
-     "  scaled: decimal(20) 0/12/3 null\n"
-     "  either: decimal(20) 0/16/3 null\n"
-     "Amt(0):\n"
-     "  Amt: decimal(20) 0/16/2 null\n"
-     "  Ccy: string attribute(272) 0/0/0 null\n",
-     "r(0):\n"
-     "  Amt: Record(2) 0/0/0 notnull\n"
-     "  chained: decimal(20) 0/18/5 null\n"
-     "  narrow: decimal(20) 0/10/2 null\n"
-     "  scaled: decimal(20) 0/12/3 null\n"
-     "  either: decimal(20) 0/12/3 null\n"
-     "Amt(0):\n"
-     "  Amt: decimal(20) 0/18/5 null\n"
-     "  Ccy: string attribute(272) 0/0/0 null\n"},
+     "r(0): Amt Record(2) notnull, chained decimal(20) 0/16/2, narrow decimal(20) 0/16/2, "
+     "scaled decimal(20) 0/12/3, either decimal(20) 0/16/3\n"
+     "Amt(0): Amt decimal(20) 0/16/2, Ccy string attribute(272)\n",
+     "r(0): Amt Record(2) notnull, chained decimal(20) 0/18/5, narrow decimal(20) 0/10/2, "
+     "scaled decimal(20) 0/12/3, either decimal(20) 0/12/3\n"
+     "Amt(0): Amt decimal(20) 0/18/5, Ccy string attribute(272)\n"},
 
     // On integers the digits are the length too; limits still narrow them.
     {"DigitsOfIntegers", kDigits,
@@ -91,14 +79,8 @@ const DetailCase kCases[] = {
           <xs:element name="small" type="Small"/>
           <xs:element name="text" type="xs:string"/>
         </xs:sequence></xs:complexType></xs:element>)",
-     "r(0):\n"
-     "  count: int(48) 0/10/0 null\n"
-     "  small: int(48) 2/2/0 null\n"
-     "  text: string(16) 0/0/0 null\n",
-     "r(0):\n"
-     "  count: int(48) 4/4/0 null\n"
-     "  small: int(48) 2/2/0 null\n"
-     "  text: string(16) 0/0/0 null\n"},
+     "r(0): count int(48) 0/10/0, small int(48) 2/2/0, text string(16)\n",
+     "r(0): count int(48) 4/4/0, small int(48) 2/2/0, text string(16)\n"},
 
     // Own minOccurs, nillable, an early "nullable" that still decides, an optional
     // group reference, choices of one and of several branches, optional sequences
@@ -142,62 +124,26 @@ const DetailCase kCases[] = {
         <xs:attribute name="may" type="xs:int" use="optional"/>
         <xs:attribute ref="globalAttr" use="required"/>
         </xs:complexType></xs:element>)",
-     "r(0):\n"
-     "  req: int(48) 0/10/0 null\n"
-     "  opt: int(48) 0/10/0 null\n"
-     "  nil: int(48) 0/10/0 null\n"
-     "  early: int(48) 0/10/0 notnull\n"
-     "  ga: int(48) 0/10/0 null\n"
-     "  inner: Record(2) 0/0/0 notnull\n"
-     "  gb: int(48) 0/10/0 null\n"
-     "  c1: int(48) 0/10/0 null\n"
-     "  c2: int(48) 0/10/0 null\n"
-     "  only: int(48) 0/10/0 null\n"
-     "  inOpt: int(48) 0/10/0 null\n"
-     "  deep: int(48) 0/10/0 null\n"
-     "  top: string(16) 0/0/0 null\n"
-     "  plainTop: string(16) 0/0/0 null\n"
-     "  kid: Record(2) 0/0/0 notnull\n"
-     "  after: int(48) 0/10/0 null\n"
-     "  held: Record(2) 0/0/0 notnull\n"
-     "  must: int attribute(304) 0/10/0 null\n"
-     "  may: int attribute(304) 0/10/0 null\n"
-     "  globalAttr: int attribute(304) 0/10/0 null\n"
-     "inner(0):\n"
-     "  x: int(48) 0/10/0 null\n"
-     "kid(0):\n"
-     "  k: int(48) 0/10/0 null\n"
-     "held(0):\n"
-     "  h1: int(48) 0/10/0 notnull\n"
-     "  h2: int(48) 0/10/0 notnull\n",
-     "r(0):\n"
-     "  req: int(48) 0/10/0 notnull\n"
-     "  opt: int(48) 0/10/0 null\n"
-     "  nil: int(48) 0/10/0 null\n"
-     "  early: int(48) 0/10/0 notnull\n"
-     "  ga: int(48) 0/10/0 null\n"
-     "  inner: Record(2) 0/0/0 null\n"
-     "  gb: int(48) 0/10/0 notnull\n"
-     "  c1: int(48) 0/10/0 null\n"
-     "  c2: int(48) 0/10/0 null\n"
-     "  only: int(48) 0/10/0 notnull\n"
-     "  inOpt: int(48) 0/10/0 null\n"
-     "  deep: int(48) 0/10/0 null\n"
-     "  top: string(16) 0/0/0 null\n"
-     "  plainTop: string(16) 0/0/0 null\n"
-     "  kid: Record(2) 0/0/0 null\n"
-     "  after: int(48) 0/10/0 notnull\n"
-     "  held: Record(2) 0/0/0 notnull\n"
-     "  must: int attribute(304) 0/10/0 notnull\n"
-     "  may: int attribute(304) 0/10/0 null\n"
-     "  globalAttr: int attribute(304) 0/10/0 notnull\n"
-     "inner(0):\n"
-     "  x: int(48) 0/10/0 notnull\n"
-     "kid(0):\n"
-     "  k: int(48) 0/10/0 notnull\n"
-     "held(0):\n"
-     "  h1: int(48) 0/10/0 notnull\n"
-     "  h2: int(48) 0/10/0 null\n"},
+     "r(0): req int(48) 0/10/0, opt int(48) 0/10/0, nil int(48) 0/10/0, "
+     "early int(48) 0/10/0 notnull, ga int(48) 0/10/0, inner Record(2) notnull, "
+     "gb int(48) 0/10/0, c1 int(48) 0/10/0, c2 int(48) 0/10/0, only int(48) 0/10/0, "
+     "inOpt int(48) 0/10/0, deep int(48) 0/10/0, top string(16), plainTop string(16), "
+     "kid Record(2) notnull, after int(48) 0/10/0, held Record(2) notnull, "
+     "must int attribute(304) 0/10/0, may int attribute(304) 0/10/0, "
+     "globalAttr int attribute(304) 0/10/0\n"
+     "inner(0): x int(48) 0/10/0\n"
+     "kid(0): k int(48) 0/10/0\n"
+     "held(0): h1 int(48) 0/10/0 notnull, h2 int(48) 0/10/0 notnull\n",
+     "r(0): req int(48) 0/10/0 notnull, opt int(48) 0/10/0, nil int(48) 0/10/0, "
+     "early int(48) 0/10/0 notnull, ga int(48) 0/10/0, inner Record(2), "
+     "gb int(48) 0/10/0 notnull, c1 int(48) 0/10/0, c2 int(48) 0/10/0, "
+     "only int(48) 0/10/0 notnull, inOpt int(48) 0/10/0, deep int(48) 0/10/0, top string(16), "
+     "plainTop string(16), kid Record(2), after int(48) 0/10/0 notnull, "
+     "held Record(2) notnull, must int attribute(304) 0/10/0 notnull, "
+     "may int attribute(304) 0/10/0, globalAttr int attribute(304) 0/10/0 notnull\n"
+     "inner(0): x int(48) 0/10/0 notnull\n"
+     "kid(0): k int(48) 0/10/0 notnull\n"
+     "held(0): h1 int(48) 0/10/0 notnull, h2 int(48) 0/10/0\n"},
 
     // Fields drawn from a base type keep the occurrence they have there; an
     // optional sequence of a nested type does not reach the type around it.
@@ -214,22 +160,12 @@ const DetailCase kCases[] = {
           <xs:element name="d" type="Derived"/>
         </xs:sequence><xs:attribute name="ra" type="xs:int" use="required"/>
         </xs:complexType></xs:element>)",
-     "r(0):\n"
-     "  d: Record(2) 0/0/0 notnull\n"
-     "  ra: int attribute(304) 0/10/0 null\n"
-     "d(0):\n"
-     "  b1: int(48) 0/10/0 null\n"
-     "  b2: int(48) 0/10/0 null\n"
-     "  d1: int(48) 0/10/0 null\n"
-     "  da: int attribute(304) 0/10/0 null\n",
-     "r(0):\n"
-     "  d: Record(2) 0/0/0 null\n"
-     "  ra: int attribute(304) 0/10/0 notnull\n"
-     "d(0):\n"
-     "  b1: int(48) 0/10/0 notnull\n"
-     "  b2: int(48) 0/10/0 null\n"
-     "  d1: int(48) 0/10/0 null\n"
-     "  da: int attribute(304) 0/10/0 notnull\n"},
+     "r(0): d Record(2) notnull, ra int attribute(304) 0/10/0\n"
+     "d(0): b1 int(48) 0/10/0, b2 int(48) 0/10/0, d1 int(48) 0/10/0, "
+     "da int attribute(304) 0/10/0\n",
+     "r(0): d Record(2), ra int attribute(304) 0/10/0 notnull\n"
+     "d(0): b1 int(48) 0/10/0 notnull, b2 int(48) 0/10/0, d1 int(48) 0/10/0, "
+     "da int attribute(304) 0/10/0 notnull\n"},
 
     // Documentation on the declaration, on its type, on both, in several languages,
     // split by references and markup, on an attribute and on a reference; an
@@ -264,28 +200,16 @@ const DetailCase kCases[] = {
         </xs:sequence><xs:attribute name="a" type="xs:int"><xs:annotation>
           <xs:documentation>An attribute</xs:documentation></xs:annotation></xs:attribute>
         </xs:complexType></xs:element>)",
-     "r(0):\n"
-     "  own: int(48) 0/10/0 null\n"
-     "  byType: string(16) 0/0/0 null\n"
-     "  both: string(16) 0/0/0 null\n"
-     "  none: int(48) 0/10/0 null\n"
-     "  party: Record(2) 0/0/0 notnull\n"
-     "  blankFirst: int(48) 0/10/0 null\n"
-     "  global: int(48) 0/10/0 null\n"
-     "  a: int attribute(304) 0/10/0 null\n"
-     "party(0):\n"
-     "  name: string(16) 0/0/0 null\n",
-     "r(0):\n"
-     "  own: int(48) 0/10/0 null \"Own bold & \xc3\xa9t\xc3\xa9 \xe2\x82\xac\xf0\x9f\x98\x80\"\n"
-     "  byType: string(16) 0/0/0 null \"A code of three letters\"\n"
-     "  both: string(16) 0/0/0 null \"Declared\"\n"
-     "  none: int(48) 0/10/0 null\n"
-     "  party: Record(2) 0/0/0 notnull \"Someone\"\n"
-     "  blankFirst: int(48) 0/10/0 null \"Second\"\n"
-     "  global: int(48) 0/10/0 null \"Global\"\n"
-     "  a: int attribute(304) 0/10/0 null \"An attribute\"\n"
-     "party(0):\n"
-     "  name: string(16) 0/0/0 null \"The name\"\n"},
+     "r(0): own int(48) 0/10/0, byType string(16), both string(16), none int(48) 0/10/0, "
+     "party Record(2) notnull, blankFirst int(48) 0/10/0, global int(48) 0/10/0, "
+     "a int attribute(304) 0/10/0\n"
+     "party(0): name string(16)\n",
+     "r(0): own int(48) 0/10/0 \"Own bold & \xc3\xa9t\xc3\xa9 \xe2\x82\xac\xf0\x9f\x98\x80\", "
+     "byType string(16) \"A code of three letters\", both string(16) \"Declared\", "
+     "none int(48) 0/10/0, party Record(2) notnull \"Someone\", "
+     "blankFirst int(48) 0/10/0 \"Second\", global int(48) 0/10/0 \"Global\", "
+     "a int attribute(304) 0/10/0 \"An attribute\"\n"
+     "party(0): name string(16) \"The name\"\n"},
 };
 
 class FieldDetail : public ::testing::TestWithParam<DetailCase> {};
@@ -318,10 +242,8 @@ TEST(FieldDetailTogether, AllOptionsOnCombineTheirResults) {
                       </xs:complexType></xs:element>)",
                                        optionsOf(kDigits | kNulls | kDescriptions));
     EXPECT_TRUE(read.ok) << read.messages;
-    EXPECT_EQ(read.records, "r(0):\n"
-                            "  a: decimal(20) 0/18/5 null \"Money\"\n"
-                            "  b: decimal(20) 0/18/5 null \"Other\"\n"
-                            "  n: decimal attribute(276) 0/18/5 notnull \"Money\"\n");
+    EXPECT_EQ(read.records, "r(0): a decimal(20) 0/18/5 \"Money\", b decimal(20) 0/18/5 \"Other\", "
+                            "n decimal attribute(276) 0/18/5 notnull \"Money\"\n");
 }
 
 } // namespace

@@ -48,12 +48,8 @@ const RecordCase kCases[] = {
             <xs:element name="sku" type="xs:string"/>
           </xs:sequence></xs:complexType></xs:element>
         </xs:sequence><xs:attribute name="status" type="xs:string"/></xs:complexType></xs:element>)",
-     "order(0):\n"
-     "  id: int(48) 0/10/0 null\n"
-     "  item: Record(2) 0/0/0 notnull\n"
-     "  status: string attribute(272) 0/0/0 null\n"
-     "item(0):\n"
-     "  sku: string(16) 0/0/0 null\n",
+     "order(0): id int(48) 0/10/0, item Record(2) notnull, status string attribute(272)\n"
+     "item(0): sku string(16)\n",
      "", true, false, kTargetNs},
 
     {"UntypedAnyTypeAndPrefixedBuiltins",
@@ -63,11 +59,8 @@ const RecordCase kCases[] = {
           <xs:element name="foreign" type="foo:int"/>
           <xs:attribute name="untypedAttr"/>
         </xs:sequence></xs:complexType></xs:element>)",
-     "r(0):\n"
-     "  note: string(16) 0/0/0 null\n"
-     "  any: string(16) 0/0/0 null\n"
-     "  foreign: int(48) 0/10/0 null\n"
-     "  untypedAttr: string attribute(272) 0/0/0 null\n",
+     "r(0): note string(16), any string(16), foreign int(48) 0/10/0, "
+     "untypedAttr string attribute(272)\n",
      "", true, false, R"(xmlns:foo="urn:foo")"},
 
     {"AttributeVariants",
@@ -81,14 +74,9 @@ const RecordCase kCases[] = {
           <xs:attribute name="code"><xs:simpleType><xs:restriction base="xs:string">
             <xs:maxLength value="8"/></xs:restriction></xs:simpleType></xs:attribute>
         </xs:complexType></xs:element>)",
-     "r(0):\n"
-     "  when: duration attribute(277) 0/0/0 null\n"
-     "  span: dateTime attribute(278) 0/0/0 null\n"
-     "  count: int attribute(304) 0/10/0 null\n"
-     "  big: positiveInteger attribute(312) 10/0/0 null\n"
-     "  plain: Attribute(256) 0/0/0 null\n"
-     "  noVariant: Record(258) 0/0/0 null\n"
-     "  code: string attribute(272) 8/0/0 null\n"},
+     "r(0): when duration attribute(277), span dateTime attribute(278), "
+     "count int attribute(304) 0/10/0, big positiveInteger attribute(312) 10/0/0, "
+     "plain Attribute(256), noVariant Record(258), code string attribute(272) 8/0/0\n"},
 
     // A type met again types its field as the first one did, with attribute and
     // nullable flags applied per field, also across records. The text of simple
@@ -112,22 +100,12 @@ const RecordCase kCases[] = {
         <xs:element name="s"><xs:complexType><xs:sequence>
           <xs:element name="f" type="Code"/>
         </xs:sequence></xs:complexType></xs:element>)",
-     "r(0):\n"
-     "  a: string(16) 5/0/0 null\n"
-     "  b: string(16) 5/0/0 notnull\n"
-     "  amt: Record(2) 0/0/0 notnull\n"
-     "  c: string(16) 9/0/0 null\n"
-     "  amt2: Record(2) 0/0/0 notnull\n"
-     "  d: string(16) 9/0/0 null\n"
-     "  e: string attribute(272) 5/0/0 null\n"
-     "amt(0):\n"
-     "  amt: decimal(20) 0/16/2 null\n"
-     "  cur: string attribute(272) 5/0/0 null\n"
-     "amt2(0):\n"
-     "  amt2: decimal(20) 0/16/2 null\n"
-     "  cur: string attribute(272) 5/0/0 null\n"
-     "s(0):\n"
-     "  f: string(16) 5/0/0 null\n",
+     "r(0): a string(16) 5/0/0, b string(16) 5/0/0 notnull, amt Record(2) notnull, "
+     "c string(16) 9/0/0, amt2 Record(2) notnull, d string(16) 9/0/0, "
+     "e string attribute(272) 5/0/0\n"
+     "amt(0): amt decimal(20) 0/16/2, cur string attribute(272) 5/0/0\n"
+     "amt2(0): amt2 decimal(20) 0/16/2, cur string attribute(272) 5/0/0\n"
+     "s(0): f string(16) 5/0/0\n",
      "", true, false, kTargetNs},
 
     {"NullableInheritedFromEnclosingDeclaration",
@@ -139,12 +117,8 @@ const RecordCase kCases[] = {
         <xs:element name="s"><xs:complexType><xs:sequence>
           <xs:element name="fresh" type="xs:int"/>
         </xs:sequence></xs:complexType></xs:element>)",
-     "r(0):\n"
-     "  inherits: int(48) 0/10/0 notnull\n"
-     "  own: int(48) 0/10/0 null\n"
-     "  off: int(48) 0/10/0 notnull\n"
-     "s(0):\n"
-     "  fresh: int(48) 0/10/0 null\n"},
+     "r(0): inherits int(48) 0/10/0 notnull, own int(48) 0/10/0, off int(48) 0/10/0 notnull\n"
+     "s(0): fresh int(48) 0/10/0\n"},
 
     {"RecursiveTypeMeetsItsOwnRecord",
      R"(<xs:complexType name="Node"><xs:sequence>
@@ -153,33 +127,20 @@ const RecordCase kCases[] = {
           <xs:element name="node" type="Node"/>
         </xs:sequence></xs:complexType>
         <xs:element name="node" type="Node"/>)",
-     "node(0):\n"
-     "  value: string(16) 0/0/0 null\n"
-     "  node: Record(2) 0/0/0 notnull\n"},
+     "node(0): value string(16), node Record(2) notnull\n"},
 
     {"SameNameSharesFirstRecord", kTwoX,
-     "r(0):\n"
-     "  a: Record(2) 0/0/0 notnull\n"
-     "  b: Record(2) 0/0/0 notnull\n"
-     "a(0):\n"
-     "  x: Record(2) 0/0/0 notnull\n"
-     "x(0):\n"
-     "  p: int(48) 0/10/0 null\n"
-     "b(0):\n"
-     "  x: Record(2) 0/0/0 notnull\n"},
+     "r(0): a Record(2) notnull, b Record(2) notnull\n"
+     "a(0): x Record(2) notnull\n"
+     "x(0): p int(48) 0/10/0\n"
+     "b(0): x Record(2) notnull\n"},
 
     {"QualifiedNamesKeepDistinctRecords", kTwoX,
-     "r(0):\n"
-     "  a: Record(2) 0/0/0 notnull\n"
-     "  b: Record(2) 0/0/0 notnull\n"
-     "a(0):\n"
-     "  [a]x: Record(2) 0/0/0 notnull\n"
-     "[a]x(0):\n"
-     "  p: int(48) 0/10/0 null\n"
-     "b(0):\n"
-     "  [b]x: Record(2) 0/0/0 notnull\n"
-     "[b]x(0):\n"
-     "  q: int(48) 0/10/0 null\n",
+     "r(0): a Record(2) notnull, b Record(2) notnull\n"
+     "a(0): [a]x Record(2) notnull\n"
+     "[a]x(0): p int(48) 0/10/0\n"
+     "b(0): [b]x Record(2) notnull\n"
+     "[b]x(0): q int(48) 0/10/0\n",
      "", true, true},
 
     {"QualifiedNamesThreeDeep",
@@ -192,14 +153,10 @@ const RecordCase kCases[] = {
             </xs:sequence></xs:complexType></xs:element>
           </xs:sequence></xs:complexType></xs:element>
         </xs:sequence></xs:complexType></xs:element>)",
-     "order(0):\n"
-     "  item: Record(2) 0/0/0 notnull\n"
-     "item(0):\n"
-     "  [item]detail: Record(2) 0/0/0 notnull\n"
-     "[item]detail(0):\n"
-     "  [item!detail]note: Record(2) 0/0/0 notnull\n"
-     "[item!detail]note(0):\n"
-     "  text: string(16) 0/0/0 null\n",
+     "order(0): item Record(2) notnull\n"
+     "item(0): [item]detail Record(2) notnull\n"
+     "[item]detail(0): [item!detail]note Record(2) notnull\n"
+     "[item!detail]note(0): text string(16)\n",
      "", true, true},
 
     {"QualifiedNameOnThePathStandsAlone",
@@ -211,12 +168,9 @@ const RecordCase kCases[] = {
         <xs:element name="top"><xs:complexType><xs:sequence>
           <xs:element name="part" type="Part"/>
         </xs:sequence></xs:complexType></xs:element>)",
-     "top(0):\n"
-     "  part: Record(2) 0/0/0 notnull\n"
-     "part(0):\n"
-     "  [part]sub: Record(2) 0/0/0 notnull\n"
-     "[part]sub(0):\n"
-     "  part: Record(2) 0/0/0 notnull\n",
+     "top(0): part Record(2) notnull\n"
+     "part(0): [part]sub Record(2) notnull\n"
+     "[part]sub(0): part Record(2) notnull\n",
      "", true, true},
 
     {"SimpleContentGivesFieldNamedAfterRecord",
@@ -224,9 +178,7 @@ const RecordCase kCases[] = {
           <xs:extension base="xs:decimal"><xs:attribute name="currency" type="xs:string"/>
           </xs:extension></xs:simpleContent></xs:complexType>
         <xs:element name="price" type="Price"/>)",
-     "price(0):\n"
-     "  price: decimal(20) 0/16/2 null\n"
-     "  currency: string attribute(272) 0/0/0 null\n"},
+     "price(0): price decimal(20) 0/16/2, currency string attribute(272)\n"},
 
     {"SimpleContentOverSchemaSimpleType",
      R"(<xs:simpleType name="Code"><xs:restriction base="xs:string">
@@ -235,9 +187,7 @@ const RecordCase kCases[] = {
           <xs:attribute name="scheme" type="xs:token"/></xs:extension></xs:simpleContent>
         </xs:complexType>
         <xs:element name="tag" type="Tagged"/>)",
-     "tag(0):\n"
-     "  tag: string(16) 6/0/0 null\n"
-     "  scheme: token attribute(319) 0/0/0 null\n"},
+     "tag(0): tag string(16) 6/0/0, scheme token attribute(319)\n"},
 
     {"ThreeLevelExtensionChainFarthestFirst",
      R"(<xs:complexType name="A"><xs:sequence><xs:element name="a1" type="xs:int"/></xs:sequence>
@@ -249,11 +199,8 @@ const RecordCase kCases[] = {
           <xs:element name="c1" type="xs:int"/></xs:sequence></xs:extension></xs:complexContent>
         </xs:complexType>
         <xs:element name="c" type="C"/>)",
-     "c(0):\n"
-     "  a1: int(48) 0/10/0 null\n"
-     "  aa: string attribute(272) 0/0/0 null\n"
-     "  b1: int(48) 0/10/0 null\n"
-     "  c1: int(48) 0/10/0 null\n"},
+     "c(0): a1 int(48) 0/10/0, aa string attribute(272), b1 int(48) 0/10/0, "
+     "c1 int(48) 0/10/0\n"},
 
     {"ChainEndingInSimpleContent",
      R"(<xs:complexType name="Amount"><xs:simpleContent><xs:extension base="xs:decimal">
@@ -263,10 +210,8 @@ const RecordCase kCases[] = {
           <xs:attribute name="tax" type="xs:boolean"/></xs:extension></xs:complexContent>
         </xs:complexType>
         <xs:element name="total" type="Total"/>)",
-     "total(0):\n"
-     "  total: decimal(20) 0/16/2 null\n"
-     "  currency: string attribute(272) 0/0/0 null\n"
-     "  tax: boolean attribute(273) 0/0/0 null\n"},
+     "total(0): total decimal(20) 0/16/2, currency string attribute(272), "
+     "tax boolean attribute(273)\n"},
 
     // A simple-content type extending another one takes its text type and
     // attributes from the whole chain.
@@ -281,11 +226,8 @@ const RecordCase kCases[] = {
           <xs:attribute name="waived" type="xs:boolean"/></xs:extension></xs:simpleContent>
         </xs:complexType>
         <xs:element name="fee" type="Fee"/>)",
-     "fee(0):\n"
-     "  fee: decimal(20) 0/16/2 null\n"
-     "  currency: string attribute(272) 0/0/0 null\n"
-     "  reason: token attribute(319) 0/0/0 null\n"
-     "  waived: boolean attribute(273) 0/0/0 null\n"},
+     "fee(0): fee decimal(20) 0/16/2, currency string attribute(272), "
+     "reason token attribute(319), waived boolean attribute(273)\n"},
 
     // Simple content over a complex type without simple content has no text type.
     {"SimpleContentOverComplexContentFails",
@@ -312,9 +254,7 @@ const RecordCase kCases[] = {
           <xs:sequence><xs:element name="a" type="xs:int"/></xs:sequence>
         </xs:restriction></xs:complexContent></xs:complexType>
         <xs:element name="narrow" type="Narrow"/>)",
-     "narrow(0):\n"
-     "  x: string attribute(272) 0/0/0 null\n"
-     "  a: int(48) 0/10/0 null\n"},
+     "narrow(0): x string attribute(272), a int(48) 0/10/0\n"},
 
     {"RestrictionRestatesOrProhibitsBaseAttributes",
      R"(<xs:attributeGroup name="Common"><xs:attribute name="id" type="xs:ID"/>
@@ -333,11 +273,8 @@ const RecordCase kCases[] = {
           <xs:attribute ref="note" use="required"/>
         </xs:restriction></xs:complexContent></xs:complexType>
         <xs:element name="narrow" type="Narrow"/>)",
-     "narrow(0):\n"
-     "  id: ID attribute(288) 0/0/0 null\n"
-     "  a: int(48) 0/10/0 null\n"
-     "  x: string attribute(272) 2/0/0 null\n"
-     "  note: string attribute(272) 0/0/0 null\n"},
+     "narrow(0): id ID attribute(288), a int(48) 0/10/0, x string attribute(272) 2/0/0, "
+     "note string attribute(272)\n"},
 
     // Restricting an extension narrows what the whole chain gave; extending a
     // restriction adds to what the restriction kept.
@@ -356,27 +293,21 @@ const RecordCase kCases[] = {
           <xs:sequence><xs:element name="d" type="xs:int"/></xs:sequence>
         </xs:extension></xs:complexContent></xs:complexType>
         <xs:element name="wide" type="Wide"/>)",
-     "wide(0):\n"
-     "  x: string attribute(272) 0/0/0 null\n"
-     "  c: int(48) 0/10/0 null\n"
-     "  y: token attribute(319) 0/0/0 null\n"
-     "  d: int(48) 0/10/0 null\n"},
+     "wide(0): x string attribute(272), c int(48) 0/10/0, y token attribute(319), "
+     "d int(48) 0/10/0\n"},
 
     {"ExtensionOfSimpleTypeGivesFieldNamedAfterRecord",
      R"(<xs:complexType name="T"><xs:complexContent><xs:extension base="xs:string">
           <xs:attribute name="lang" type="xs:language"/></xs:extension></xs:complexContent>
         </xs:complexType>
         <xs:element name="text" type="T"/>)",
-     "text(0):\n"
-     "  text: string(16) 0/0/0 null\n"
-     "  lang: language attribute(292) 0/0/0 null\n"},
+     "text(0): text string(16), lang language attribute(292)\n"},
 
     {"AnyTypeBaseAddsNothing",
      R"(<xs:element name="r"><xs:complexType><xs:complexContent>
           <xs:restriction base="xs:anyType"><xs:sequence><xs:element name="x" type="xs:int"/>
           </xs:sequence></xs:restriction></xs:complexContent></xs:complexType></xs:element>)",
-     "r(0):\n"
-     "  x: int(48) 0/10/0 null\n"},
+     "r(0): x int(48) 0/10/0\n"},
 
     {"ElementAndAttributeReferences",
      R"(<xs:element name="code" type="xs:string" nullable="false"/>
@@ -384,10 +315,7 @@ const RecordCase kCases[] = {
         <xs:element name="r"><xs:complexType><xs:sequence>
           <xs:element ref="code"/><xs:element ref="code"/>
         </xs:sequence><xs:attribute ref="lang"/></xs:complexType></xs:element>)",
-     "r(0):\n"
-     "  code: string(16) 0/0/0 notnull\n"
-     "  code: string(16) 0/0/0 notnull\n"
-     "  lang: language attribute(292) 0/0/0 null\n"},
+     "r(0): code string(16) notnull, code string(16) notnull, lang language attribute(292)\n"},
 
     {"ReferenceToRecordElement",
      R"(<xs:element name="r"><xs:complexType><xs:sequence>
@@ -397,11 +325,8 @@ const RecordCase kCases[] = {
           <xs:element name="city" type="xs:string"/>
           <xs:element ref="addr"/>
         </xs:sequence></xs:complexType></xs:element>)",
-     "r(0):\n"
-     "  addr: Record(2) 0/0/0 notnull\n"
-     "addr(0):\n"
-     "  city: string(16) 0/0/0 null\n"
-     "  addr: Record(2) 0/0/0 notnull\n"},
+     "r(0): addr Record(2) notnull\n"
+     "addr(0): city string(16), addr Record(2) notnull\n"},
 
     {"GroupsAndAttributeGroups",
      R"(<xs:group name="g"><xs:sequence><xs:element name="x" type="xs:int"/>
@@ -412,13 +337,8 @@ const RecordCase kCases[] = {
         <xs:element name="r"><xs:complexType><xs:sequence>
           <xs:element name="first" type="xs:int"/><xs:group ref="g"/><xs:group ref="inner"/>
         </xs:sequence><xs:attributeGroup ref="ag"/></xs:complexType></xs:element>)",
-     "r(0):\n"
-     "  first: int(48) 0/10/0 null\n"
-     "  x: int(48) 0/10/0 null\n"
-     "  z: byte(50) 0/3/0 null\n"
-     "  y: string(16) 0/0/0 null\n"
-     "  z: byte(50) 0/3/0 null\n"
-     "  id: ID attribute(288) 0/0/0 null\n"},
+     "r(0): first int(48) 0/10/0, x int(48) 0/10/0, z byte(50) 0/3/0, y string(16), "
+     "z byte(50) 0/3/0, id ID attribute(288)\n"},
 
     {"GroupMetAgainInsideNestedRecord",
      R"(<xs:group name="g"><xs:sequence><xs:element name="e"><xs:complexType>
@@ -426,18 +346,14 @@ const RecordCase kCases[] = {
         </xs:sequence></xs:group>
         <xs:element name="r"><xs:complexType><xs:sequence><xs:group ref="g"/></xs:sequence>
         </xs:complexType></xs:element>)",
-     "r(0):\n"
-     "  e: Record(2) 0/0/0 notnull\n"
-     "e(0):\n"
-     "  e: Record(2) 0/0/0 notnull\n"},
+     "r(0): e Record(2) notnull\n"
+     "e(0): e Record(2) notnull\n"},
 
     {"DuplicateDeclarationsGiveTwoFields",
      R"(<xs:element name="r"><xs:complexType><xs:sequence>
           <xs:element name="x" type="xs:int"/><xs:element name="x" type="xs:string"/>
         </xs:sequence></xs:complexType></xs:element>)",
-     "r(0):\n"
-     "  x: int(48) 0/10/0 null\n"
-     "  x: string(16) 0/0/0 null\n"},
+     "r(0): x int(48) 0/10/0, x string(16)\n"},
 
     {"AuthorNamedAnonTypeFoundInAnyNamespace",
      R"(<xs:complexType name="anonAddress"><xs:sequence>
@@ -445,20 +361,16 @@ const RecordCase kCases[] = {
         <xs:element name="r"><xs:complexType><xs:sequence>
           <xs:element name="home" type="other:anonAddress"/>
         </xs:sequence></xs:complexType></xs:element>)",
-     "r(0):\n"
-     "  home: Record(2) 0/0/0 notnull\n"
-     "home(0):\n"
-     "  city: string(16) 0/0/0 null\n",
+     "r(0): home Record(2) notnull\n"
+     "home(0): city string(16)\n",
      "", true, false, R"(targetNamespace="urn:t" xmlns="urn:t" xmlns:other="urn:o")"},
 
     {"ForeignNamesKeepTheirPrefix",
      R"(<xs:element name="o:r"><xs:complexType><xs:sequence>
           <xs:element name="o:x" type="xs:int"/><xs:element name="y" type="xs:int"/>
         </xs:sequence></xs:complexType></xs:element>)",
-     "o:r(0):\n"
-     "  o:x: int(48) 0/10/0 null\n"
-     "  y: int(48) 0/10/0 null\n",
-     "", true, false, R"(targetNamespace="urn:t" xmlns:o="urn:o")"},
+     "o:r(0): o:x int(48) 0/10/0, y int(48) 0/10/0\n", "", true, false,
+     R"(targetNamespace="urn:t" xmlns:o="urn:o")"},
 
     {"FacetsShapeFields",
      R"(<xs:simpleType name="Qty"><xs:restriction base="xs:int">
@@ -472,12 +384,8 @@ const RecordCase kCases[] = {
           <xs:element name="qty" type="Qty"/><xs:element name="status" type="Status"/>
           <xs:element name="zip" type="Zip"/><xs:element name="again" type="Qty"/>
         </xs:sequence><xs:attribute name="st" type="Status"/></xs:complexType></xs:element>)",
-     "r(0):\n"
-     "  qty: int(48) 4/4/0 null\n"
-     "  status: string(16) 7/0/0 null\n"
-     "  zip: string(16) 0/10/0 null\n"
-     "  again: int(48) 4/4/0 null\n"
-     "  st: string attribute(272) 7/0/0 null\n"},
+     "r(0): qty int(48) 4/4/0, status string(16) 7/0/0, zip string(16) 0/10/0, "
+     "again int(48) 4/4/0, st string attribute(272) 7/0/0\n"},
 
     {"TopLevelSimpleOrUnknownTypesBuildNothing",
      R"(<xs:element name="a" type="xs:int"/><xs:element name="b" type="Unknown"/>
@@ -492,8 +400,7 @@ const RecordCase kCases[] = {
             <xs:element name="bad" type="Nope"/></xs:sequence></xs:complexType></xs:element>
           <xs:element name="never" type="xs:int"/>
         </xs:sequence></xs:complexType></xs:element>)",
-     "r(0):\n"
-     "  ok: int(48) 0/10/0 null\n"
+     "r(0): ok int(48) 0/10/0\n"
      "s(0):\n",
      "4 0 Lookup of type 'Nope' (ns 'urn:t') failed for field 'bad'\n", false, false, kTargetNs},
 
@@ -573,17 +480,13 @@ const RecordCase kCases[] = {
      R"(<xs:element name="r"><xs:complexType><xs:sequence>
           <xs:element name="x" type="xs:int"/><xs:group ref="nothing"/>
         </xs:sequence></xs:complexType></xs:element>)",
-     "r(0):\n"
-     "  x: int(48) 0/10/0 null\n",
-     "4 4 Unable to find group nothing\n", false},
+     "r(0): x int(48) 0/10/0\n", "4 4 Unable to find group nothing\n", false},
 
     {"GroupReferringToItself",
      R"(<xs:group name="g"><xs:sequence><xs:element name="x" type="xs:int"/>
           <xs:group ref="g"/></xs:sequence></xs:group>
         <xs:element name="r"><xs:complexType><xs:group ref="g"/></xs:complexType></xs:element>)",
-     "r(0):\n"
-     "  x: int(48) 0/10/0 null\n",
-     "4 0 Circular reference to group g\n", false},
+     "r(0): x int(48) 0/10/0\n", "4 0 Circular reference to group g\n", false},
 
     // A simple-content restriction of a complex base without text types its text by
     // the simple type it defines.
@@ -597,9 +500,7 @@ const RecordCase kCases[] = {
           <xs:attribute name="kind"><xs:simpleType><xs:restriction base="xs:int"/>
           </xs:simpleType></xs:attribute></xs:restriction></xs:simpleContent></xs:complexType>
         <xs:element name="r" type="Str"/>)",
-     "r(0):\n"
-     "  r: string(16) 4/0/0 null\n"
-     "  kind: int attribute(304) 0/10/0 null\n"},
+     "r(0): r string(16) 4/0/0, kind int attribute(304) 0/10/0\n"},
     // Types and groups have names of their own: a group reference finds no type.
     {"GroupReferenceFindsNoTypeOfThatName",
      R"(<xs:complexType name="T"><xs:sequence><xs:group ref="T"/></xs:sequence></xs:complexType>

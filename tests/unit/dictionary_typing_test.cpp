@@ -462,11 +462,8 @@ const SchemaTypingCase kSchemaTyping[] = {
           <xs:element name="small"><xs:simpleType><xs:restriction base="xs:int">
             <xs:maxExclusive value="100"/></xs:restriction></xs:simpleType></xs:element>
         </xs:sequence></xs:complexType></xs:element>)",
-     "r(0):\n"
-     "  count: int(48) 0/10/0 null\n"
-     "  size: nonNegativeInteger(51) 0/10/0 null\n"
-     "  month: int(48) 2/2/0 null\n"
-     "  small: int(48) 2/2/0 null\n"},
+     "r(0): count int(48) 0/10/0, size nonNegativeInteger(51) 0/10/0, month int(48) 2/2/0, "
+     "small int(48) 2/2/0\n"},
 
     // The facets narrow the text of the restricting type only.
     {"SimpleContentRestrictionFacetsNarrowTheText",
@@ -492,26 +489,13 @@ const SchemaTypingCase kSchemaTyping[] = {
           <xs:element name="small" type="Small"/>
           <xs:element name="tiny" type="Tiny"/>
         </xs:sequence></xs:complexType></xs:element>)",
-     "r(0):\n"
-     "  short: Record(2) 0/0/0 notnull\n"
-     "  kind: Record(2) 0/0/0 notnull\n"
-     "  long: string(16) 10/0/0 null\n"
-     "  amount: Record(2) 0/0/0 notnull\n"
-     "  small: Record(2) 0/0/0 notnull\n"
-     "  tiny: Record(2) 0/0/0 notnull\n"
-     "short(0):\n"
-     "  short: string(16) 2/0/0 null\n"
-     "kind(0):\n"
-     "  kind: string(16) 6/0/0 null\n"
-     "amount(0):\n"
-     "  amount: string(16) 10/0/0 null\n"
-     "  cur: string attribute(272) 0/0/0 null\n"
-     "small(0):\n"
-     "  small: string(16) 5/0/0 null\n"
-     "  cur: string attribute(272) 0/0/0 null\n"
-     "tiny(0):\n"
-     "  tiny: string(16) 3/0/0 null\n"
-     "  cur: string attribute(272) 0/0/0 null\n"},
+     "r(0): short Record(2) notnull, kind Record(2) notnull, long string(16) 10/0/0, "
+     "amount Record(2) notnull, small Record(2) notnull, tiny Record(2) notnull\n"
+     "short(0): short string(16) 2/0/0\n"
+     "kind(0): kind string(16) 6/0/0\n"
+     "amount(0): amount string(16) 10/0/0, cur string attribute(272)\n"
+     "small(0): small string(16) 5/0/0, cur string attribute(272)\n"
+     "tiny(0): tiny string(16) 3/0/0, cur string attribute(272)\n"},
 
     // A declaration's own anonymous type is its type, whatever the schema names its
     // types: here the generated names would be anon0 (r's type) and anon1.
@@ -526,12 +510,8 @@ const SchemaTypingCase kSchemaTyping[] = {
           <xs:element name="named" type="anon1"/>
           <xs:element name="box" type="anon0"/>
         </xs:sequence></xs:complexType></xs:element>)",
-     "r(0):\n"
-     "  inline: int(48) 5/5/0 null\n"
-     "  named: string(16) 3/0/0 null\n"
-     "  box: Record(2) 0/0/0 notnull\n"
-     "box(0):\n"
-     "  wrong: string(16) 0/0/0 null\n"},
+     "r(0): inline int(48) 5/5/0, named string(16) 3/0/0, box Record(2) notnull\n"
+     "box(0): wrong string(16)\n"},
 };
 
 class SchemaTyping : public ::testing::TestWithParam<SchemaTypingCase> {};

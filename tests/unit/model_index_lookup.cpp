@@ -347,34 +347,18 @@ constexpr const char* kStressPart = R"(<?xml version="1.0"?>
 // - price and tax have simple content: each text field is typed by the record's own
 //   base (decimal), whatever the author names a type (here anon1, which later names);
 // - b:item and a:item: the urn:b declaration (a date) and the first urn:a one (int).
-constexpr const char* kStressRecords = "a:root(0):\n"
-                                       "  a:dup: Record(2) 0/0/0 notnull\n"
-                                       "  a:sharedA: Record(2) 0/0/0 notnull\n"
-                                       "  a:fromGroupA: string(16) 0/0/0 null\n"
-                                       "  a:sharedB: Record(2) 0/0/0 notnull\n"
-                                       "  fromGroupB: string(16) 0/0/0 null\n"
-                                       "  a:codeA: string(16) 3/0/0 null\n"
-                                       "  a:codeB: string(16) 7/0/0 null\n"
-                                       "  a:party: Record(2) 0/0/0 notnull\n"
-                                       "  a:price: Record(2) 0/0/0 notnull\n"
-                                       "  a:tax: Record(2) 0/0/0 notnull\n"
-                                       "  a:later: string(16) 9/0/0 null\n"
-                                       "  item: date(57) 0/0/0 null\n"
-                                       "  a:item: int(48) 0/10/0 null\n"
-                                       "a:dup(0):\n"
-                                       "  a:first: int(48) 0/10/0 null\n"
-                                       "a:sharedA(0):\n"
-                                       "  a:fromTypeA: string(16) 0/0/0 null\n"
-                                       "a:sharedB(0):\n"
-                                       "  fromTypeB: string(16) 0/0/0 null\n"
-                                       "a:party(0):\n"
-                                       "  a:partyId: string(16) 0/0/0 null\n"
-                                       "a:price(0):\n"
-                                       "  a:price: decimal(20) 0/16/2 null\n"
-                                       "  a:currency: string attribute(272) 3/0/0 null\n"
-                                       "a:tax(0):\n"
-                                       "  a:tax: decimal(20) 0/16/2 null\n"
-                                       "  a:currency: string attribute(272) 3/0/0 null\n";
+constexpr const char* kStressRecords =
+    "a:root(0): a:dup Record(2) notnull, a:sharedA Record(2) notnull, "
+    "a:fromGroupA string(16), a:sharedB Record(2) notnull, fromGroupB string(16), "
+    "a:codeA string(16) 3/0/0, a:codeB string(16) 7/0/0, a:party Record(2) notnull, "
+    "a:price Record(2) notnull, a:tax Record(2) notnull, a:later string(16) 9/0/0, "
+    "item date(57), a:item int(48) 0/10/0\n"
+    "a:dup(0): a:first int(48) 0/10/0\n"
+    "a:sharedA(0): a:fromTypeA string(16)\n"
+    "a:sharedB(0): fromTypeB string(16)\n"
+    "a:party(0): a:partyId string(16)\n"
+    "a:price(0): a:price decimal(20) 0/16/2, a:currency string attribute(272) 3/0/0\n"
+    "a:tax(0): a:tax decimal(20) 0/16/2, a:currency string attribute(272) 3/0/0\n";
 
 TEST(IndexedReads, StressSchemaGivesTheRecordsOfTheFirstMatchRule) {
     TempDir dir;

@@ -35,12 +35,9 @@ const char* const kOrderSchema = R"(
   </xs:sequence></xs:complexType></xs:element>
 </xs:sequence><xs:attribute name="status" type="xs:string"/></xs:complexType></xs:element>)";
 
-const char* const kOrderRecords = "order(0):\n"
-                                  "  id: int(48) 0/10/0 null\n"
-                                  "  item: Record(2) 0/0/0 notnull\n"
-                                  "  status: string attribute(272) 0/0/0 null\n"
-                                  "item(0):\n"
-                                  "  sku: string(16) 0/0/0 null\n";
+const char* const kOrderRecords =
+    "order(0): id int(48) 0/10/0, item Record(2) notnull, status string attribute(272)\n"
+    "item(0): sku string(16)\n";
 
 std::string recordNames(const ZrRecordList& list) {
     std::string out;

@@ -59,21 +59,13 @@ const DocumentsCase kCases[] = {
                  <xs:element ref="b:party"/><xs:element name="code" type="b:Code"/>
                  <xs:group ref="b:G"/></xs:sequence></xs:complexType></xs:element>)")},
       {"sub/b.xsd", kDocB}},
-     "r(0):\n"
-     "  b:party: Record(2) 0/0/0 notnull\n"
-     "  code: string(16) 9/0/0 null\n"
-     "  b:g: int(48) 0/10/0 null\n"
-     "b:party(0):\n"
-     "  b:id: string(16) 9/0/0 null\n"},
+     "r(0): b:party Record(2) notnull, code string(16) 9/0/0, b:g int(48) 0/10/0\n"
+     "b:party(0): b:id string(16) 9/0/0\n"},
     // The main schema's own type answers first, with the import as without it.
-    {"LookupWithoutTheImport",
-     {{"main.xsd", mainUsingCode(false)}},
-     "r(0):\n"
-     "  c: string(16) 3/0/0 null\n"},
+    {"LookupWithoutTheImport", {{"main.xsd", mainUsingCode(false)}}, "r(0): c string(16) 3/0/0\n"},
     {"SameLookupWithTheImport",
      {{"main.xsd", mainUsingCode(true)}, {"b.xsd", kDocB}},
-     "r(0):\n"
-     "  c: string(16) 3/0/0 null\n"},
+     "r(0): c string(16) 3/0/0\n"},
     {"UnusedImportsThatCannotBeReadAreSilent",
      {{"main.xsd", doc(kMainA, R"(<xs:import namespace="urn:m" schemaLocation="missing.xsd"/>
                <xs:import namespace="urn:h" schemaLocation="http://127.0.0.1:9/h.xsd"/>
@@ -123,8 +115,7 @@ const DocumentsCase kCases[] = {
       {"chameleon.xsd", doc("", R"(<xs:include schemaLocation="b.xsd"/>
                <xs:simpleType name="T"><xs:restriction base="xs:string">
                  <xs:maxLength value="7"/></xs:restriction></xs:simpleType>)")}},
-     "r(0):\n"
-     "  t: string(16) 7/0/0 null\n"},
+     "r(0): t string(16) 7/0/0\n"},
     {"RedefinitionsReplaceAndReferToTheOriginal",
      {{"main.xsd", doc(kMainA, R"(<xs:redefine schemaLocation="base.xsd">
                  <xs:complexType name="T"><xs:complexContent><xs:extension base="T">
@@ -141,25 +132,16 @@ const DocumentsCase kCases[] = {
                <xs:group name="G"><xs:sequence><xs:element name="g" type="xs:date"/>
                </xs:sequence></xs:group>
                <xs:element name="u" type="T"/>)")}},
-     "r(0):\n"
-     "  kept: string(16) 0/0/0 null\n"
-     "  added: int(48) 0/10/0 null\n"
-     "s(0):\n"
-     "  g: date(57) 0/0/0 null\n"
-     "  more: string(16) 0/0/0 null\n"
-     "u(0):\n"
-     "  kept: string(16) 0/0/0 null\n"
-     "  added: int(48) 0/10/0 null\n"},
+     "r(0): kept string(16), added int(48) 0/10/0\n"
+     "s(0): g date(57), more string(16)\n"
+     "u(0): kept string(16), added int(48) 0/10/0\n"},
     {"XmlNamespaceIsBuiltIn",
      {{"main.xsd", doc(kMainA, R"(<xs:element name="r"><xs:complexType>
                  <xs:attribute ref="xml:lang"/>
                  <xs:attributeGroup ref="xml:specialAttrs"/></xs:complexType></xs:element>)")}},
-     "r(0):\n"
-     "  xml:lang: language attribute(292) 0/0/0 null\n"
-     "  xml:base: anyURI attribute(287) 0/0/0 null\n"
-     "  xml:lang: language attribute(292) 0/0/0 null\n"
-     "  xml:space: NCName attribute(299) 8/0/0 null\n"
-     "  xml:id: ID attribute(288) 0/0/0 null\n"},
+     "r(0): xml:lang language attribute(292), xml:base anyURI attribute(287), "
+     "xml:lang language attribute(292), xml:space NCName attribute(299) 8/0/0, "
+     "xml:id ID attribute(288)\n"},
     // An import of the XML namespace that cannot be read leaves the built-in one.
     {"XmlNamespaceDeclaredAndImportedFromTheNetwork",
      {{"main.xsd", doc(kMainA + R"( xmlns:xml="http://www.w3.org/XML/1998/namespace")",
@@ -167,8 +149,7 @@ const DocumentsCase kCases[] = {
                          schemaLocation="http://www.w3.org/2001/xml.xsd"/>
                <xs:element name="r"><xs:complexType><xs:attribute ref="xml:space"/>
                </xs:complexType></xs:element>)")}},
-     "r(0):\n"
-     "  xml:space: NCName attribute(299) 8/0/0 null\n"},
+     "r(0): xml:space NCName attribute(299) 8/0/0\n"},
     {"ImportedXmlNamespaceDocumentWins",
      {{"main.xsd", doc(kMainA, R"(<xs:import namespace="http://www.w3.org/XML/1998/namespace"
                                 schemaLocation="xml.xsd"/>
@@ -178,8 +159,7 @@ const DocumentsCase kCases[] = {
                       R"(<xs:attribute name="lang"><xs:simpleType><xs:restriction
                    base="xs:string"><xs:maxLength value="35"/></xs:restriction>
                  </xs:simpleType></xs:attribute>)")}},
-     "r(0):\n"
-     "  xml:lang: string attribute(272) 35/0/0 null\n"},
+     "r(0): xml:lang string attribute(272) 35/0/0\n"},
 };
 
 class Documents : public ::testing::TestWithParam<DocumentsCase> {};
