@@ -100,7 +100,8 @@ const RecordCase kCases[] = {
     // content is typed by its own base, and a declaration's own anonymous type is its
     // type, whatever names the author gives types: a declared "anon2" answers only
     // for the fields that name it, and the generated names would be anon0 (r's type)
-    // and anon1 (inline's).
+    // and anon1 (inline's); an author's name beginning with "anon" is found in any
+    // namespace. Names written with a foreign prefix keep it.
     {"RepeatedFieldTypes",
      R"(<xs:simpleType name="Code"><xs:restriction base="xs:string">
           <xs:maxLength value="5"/></xs:restriction></xs:simpleType>
@@ -126,6 +127,12 @@ const RecordCase kCases[] = {
         </xs:sequence><xs:attribute name="e" type="Code"/></xs:complexType></xs:element>
         <xs:element name="s"><xs:complexType><xs:sequence>
           <xs:element name="f" type="Code"/>
+        </xs:sequence></xs:complexType></xs:element>
+        <xs:complexType name="anonAddress"><xs:sequence>
+          <xs:element name="city" type="xs:string"/></xs:sequence></xs:complexType>
+        <xs:element name="o:r"><xs:complexType><xs:sequence>
+          <xs:element name="home" type="o:anonAddress"/>
+          <xs:element name="o:x" type="xs:int"/><xs:element name="y" type="xs:int"/>
         </xs:sequence></xs:complexType></xs:element>)",
      "r(0): inline int(48) 5/5/0, named string(16) 3/0/0, box Record(2) notnull, "
      "a string(16) 5/0/0, b string(16) 5/0/0 notnull, amt Record(2) notnull, "
@@ -134,8 +141,10 @@ const RecordCase kCases[] = {
      "box(0): wrong string(16)\n"
      "amt(0): amt decimal(20) 0/16/2, cur string attribute(272) 5/0/0\n"
      "amt2(0): amt2 decimal(20) 0/16/2, cur string attribute(272) 5/0/0\n"
-     "s(0): f string(16) 5/0/0\n",
-     "", true, false, kTargetNs},
+     "s(0): f string(16) 5/0/0\n"
+     "o:r(0): home Record(2) notnull, o:x int(48) 0/10/0, y int(48) 0/10/0\n"
+     "home(0): city string(16)\n",
+     "", true, false, R"(targetNamespace="urn:t" xmlns="urn:t" xmlns:o="urn:o")"},
 
     {"NullableInheritedFromEnclosingDeclaration",
      R"(<xs:element name="r" nullable="false"><xs:complexType><xs:sequence>
@@ -290,7 +299,8 @@ const RecordCase kCases[] = {
      "z token attribute(319), d int(48) 0/10/0\n"},
 
     // The facets of a simple-content restriction narrow the text of the restricting
-    // type only.
+    // type only; one of a complex base without text types its text by the simple type
+    // it defines.
     {"SimpleContentRestrictionFacetsNarrowTheText",
      R"(<xs:simpleType name="code"><xs:restriction base="xs:string">
           <xs:maxLength value="10"/></xs:restriction></xs:simpleType>
@@ -306,6 +316,14 @@ const RecordCase kCases[] = {
           <xs:maxLength value="5"/></xs:restriction></xs:simpleContent></xs:complexType>
         <xs:complexType name="Tiny"><xs:simpleContent><xs:restriction base="Small">
           <xs:maxLength value="3"/></xs:restriction></xs:simpleContent></xs:complexType>
+        <xs:complexType name="Masked"><xs:complexContent><xs:extension base="xs:anyType">
+          <xs:attribute name="mask" type="xs:boolean"/></xs:extension></xs:complexContent>
+        </xs:complexType>
+        <xs:complexType name="Str"><xs:simpleContent><xs:restriction base="Masked">
+          <xs:simpleType><xs:restriction base="xs:string"><xs:maxLength value="4"/>
+          </xs:restriction></xs:simpleType>
+          <xs:attribute name="kind"><xs:simpleType><xs:restriction base="xs:int"/>
+          </xs:simpleType></xs:attribute></xs:restriction></xs:simpleContent></xs:complexType>
         <xs:element name="r"><xs:complexType><xs:sequence>
           <xs:element name="short" type="Short"/>
           <xs:element name="kind" type="Kind"/>
@@ -313,45 +331,17 @@ const RecordCase kCases[] = {
           <xs:element name="amount" type="Amount"/>
           <xs:element name="small" type="Small"/>
           <xs:element name="tiny" type="Tiny"/>
+          <xs:element name="str" type="Str"/>
         </xs:sequence></xs:complexType></xs:element>)",
      "r(0): short Record(2) notnull, kind Record(2) notnull, long string(16) 10/0/0, "
-     "amount Record(2) notnull, small Record(2) notnull, tiny Record(2) notnull\n"
+     "amount Record(2) notnull, small Record(2) notnull, tiny Record(2) notnull, "
+     "str Record(2) notnull\n"
      "short(0): short string(16) 2/0/0\n"
      "kind(0): kind string(16) 6/0/0\n"
      "amount(0): amount string(16) 10/0/0, cur string attribute(272)\n"
      "small(0): small string(16) 5/0/0, cur string attribute(272)\n"
-     "tiny(0): tiny string(16) 3/0/0, cur string attribute(272)\n"},
-
-    // A simple-content restriction of a complex base without text types its text by
-    // the simple type it defines.
-    {"SimpleContentRestrictionOfAComplexBaseTypesItsTextByItsOwnType",
-     R"(<xs:complexType name="Base"><xs:complexContent><xs:extension base="xs:anyType">
-          <xs:attribute name="mask" type="xs:boolean"/></xs:extension></xs:complexContent>
-        </xs:complexType>
-        <xs:complexType name="Str"><xs:simpleContent><xs:restriction base="Base">
-          <xs:simpleType><xs:restriction base="xs:string"><xs:maxLength value="4"/>
-          </xs:restriction></xs:simpleType>
-          <xs:attribute name="kind"><xs:simpleType><xs:restriction base="xs:int"/>
-          </xs:simpleType></xs:attribute></xs:restriction></xs:simpleContent></xs:complexType>
-        <xs:element name="r" type="Str"/>)",
-     "r(0): r string(16) 4/0/0, kind int attribute(304) 0/10/0\n"},
-
-    {"AuthorNamedAnonTypeFoundInAnyNamespace",
-     R"(<xs:complexType name="anonAddress"><xs:sequence>
-          <xs:element name="city" type="xs:string"/></xs:sequence></xs:complexType>
-        <xs:element name="r"><xs:complexType><xs:sequence>
-          <xs:element name="home" type="other:anonAddress"/>
-        </xs:sequence></xs:complexType></xs:element>)",
-     "r(0): home Record(2) notnull\n"
-     "home(0): city string(16)\n",
-     "", true, false, R"(targetNamespace="urn:t" xmlns="urn:t" xmlns:other="urn:o")"},
-
-    {"ForeignNamesKeepTheirPrefix",
-     R"(<xs:element name="o:r"><xs:complexType><xs:sequence>
-          <xs:element name="o:x" type="xs:int"/><xs:element name="y" type="xs:int"/>
-        </xs:sequence></xs:complexType></xs:element>)",
-     "o:r(0): o:x int(48) 0/10/0, y int(48) 0/10/0\n", "", true, false,
-     R"(targetNamespace="urn:t" xmlns:o="urn:o")"},
+     "tiny(0): tiny string(16) 3/0/0, cur string attribute(272)\n"
+     "str(0): str string(16) 4/0/0, kind int attribute(304) 0/10/0\n"},
 
     // Failures: the read fails and the records built so far stay with the browser.
     {"UnknownFieldType",
