@@ -115,57 +115,42 @@ TEST(PatternScan, RandomPatternsEndInsideTheirText) {
     }
 }
 
-// The digits that limits give a built-in type's precision and length, kUnchanged for
-// none.
-TEST(Limits, Digits) {
-    const struct {
-        const char* type;
-        const char* minInclusive;
-        const char* maxInclusive;
-        const char* minExclusive;
-        const char* maxExclusive;
-        long digits;
-    } cases[] = {{"int", "0", "999", "", "", 3},
-                 {"int", "", "", "", "1000", 3},
-                 {"int", "", "", "", "0", 1},
-                 {"int", "-50", "9", "", "", 2},
-                 {"int", "-2147483648", "0", "", "", 10},
-                 {"int", "", "0", "-2147483648", "", 10},
-                 {"long", "-99999999999", "0", "", "", 10},
-                 {"long", "", "99999999999", "", "", 10},
-                 {"int", "", "5", "99", "", 3},
-                 {"int", "5", "9", "99999", "", 1},
-                 {"int", "", "99", "", "", 2},
-                 {"int", "", "1e5", "", "", 1},
-                 {"int", "", "  +42", "", "", 2},
-                 {"short", "", "123.456", "", "", 3},
-                 {"int attribute", "0", "99", "", "", 2},
-                 {"normalizedString", "0", "999", "", "", 3},
-                 {"token", "0", "999", "", "", 3},
-                 {"Character", "0", "12345", "", "", 5},
-                 {"positiveInteger", "1", "100", "", "", 3},
-                 // A lower bound alone, no number, zero on both sides.
-                 {"int", "1", "", "", "", kUnchanged},
-                 {"nonNegativeInteger", "", "", "0", "", kUnchanged},
-                 {"int", "", "abc", "", "", kUnchanged},
-                 {"int", "0", "0", "", "", kUnchanged},
-                 // Types whose values carry no digit count.
-                 {"string", "0", "999", "", "", kUnchanged},
-                 {"string attribute", "0", "999", "", "", kUnchanged},
-                 {"decimal", "0", "999", "", "", kUnchanged},
-                 {"date", "0", "999", "", "", kUnchanged},
-                 {"hexBinary", "0", "999", "", "", kUnchanged}};
+// Limits on a built-in type ("@" for its attribute variant), each "type minInclusive
+// maxInclusive minExclusive maxExclusive digits" with "-" for none, and the digits
+// they give its precision and length: a lower bound alone gives none, as do types
+// whose values carry no digit count.
+constexpr const char* kLimits = R"(
+int 0 999 - - 3   int - - - 1000 3   int - - - 0 1   int -50 9 - - 2
+int -2147483648 0 - - 10   int - 0 -2147483648 - 10   long -99999999999 0 - - 10
+long - 99999999999 - - 10   int - 5 99 - 3   int 5 9 99999 - 1   int - 99 - - 2
+int - 1e5 - - 1   short - 123.456 - - 3   int@ 0 99 - - 2   normalizedString 0 999 - - 3
+token 0 999 - - 3   Character 0 12345 - - 5   positiveInteger 1 100 - - 3   int 1 - - - -
+nonNegativeInteger - - 0 - -   int - abc - - -   int 0 0 - - -   string 0 999 - - -
+string@ 0 999 - - -   decimal 0 999 - - -   date 0 999 - - -   hexBinary 0 999 - - -
+)";
 
+TEST(Limits, Digits) {
     const BuiltinTypes builtins;
-    for (const auto& c : cases) {
-        ZrDType type = *builtins.builtinByName(wide(c.type).view());
+    auto digits = [&](std::string name, const std::string(&limits)[4]) {
+        if (name.back() == '@')
+            name = name.substr(0, name.size() - 1) + " attribute";
+        ZrDType type = *builtins.builtinByName(wide(name).view());
         type.Precision(kUnchanged);
         type.Length(kUnchanged);
-        dtLimits(type, wide(c.minInclusive).c_str(), wide(c.maxInclusive).c_str(),
-                 wide(c.minExclusive).c_str(), wide(c.maxExclusive).c_str());
-        EXPECT_EQ(type.Precision(), c.digits) << c.type << " " << c.maxInclusive;
-        EXPECT_EQ(type.Length(), c.digits) << c.type << " " << c.maxInclusive;
-    }
+        std::u16string text[4];
+        for (int i = 0; i < 4; ++i)
+            text[i] = limits[i] == "-" ? u"" : wide(limits[i]).str();
+        dtLimits(type, text[0].c_str(), text[1].c_str(), text[2].c_str(), text[3].c_str());
+        EXPECT_EQ(type.Length(), type.Precision());
+        return type.Precision();
+    };
+    std::istringstream table(kLimits);
+    std::string name, limits[4], expected;
+    while (table >> name >> limits[0] >> limits[1] >> limits[2] >> limits[3] >> expected)
+        EXPECT_EQ(digits(name, limits), expected == "-" ? kUnchanged : std::stol(expected))
+            << name << " " << limits[1];
+    // Leading blanks and a sign are skipped.
+    EXPECT_EQ(digits("int", {"-", "  +42", "-", "-"}), 2);
 }
 
 // Simple types placed in the model by hand, resolved by lookupType. A type is
