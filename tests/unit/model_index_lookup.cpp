@@ -52,23 +52,18 @@ TEST(NamedListLookups, RandomOperationsAnswerLikeAScan) {
         NamedList<Entry> list;
         int nextId = 0;
         for (int op = 0; op < 1500; ++op) {
-            const unsigned roll = rng() % 100;
-            if (roll < 2) {
+            if (rng() % 100 < 2)
                 list.clear();
-            } else {
+            else
                 list.push_back(Entry{ZrWString(names[rng() % std::size(names)]),
                                      ZrWString(spaces[rng() % std::size(spaces)]), nextId++});
-            }
-            for (const auto& name : names) {
-                for (const auto& ns : spaces) {
-                    ASSERT_EQ(idOf(list.find(name, ns)), idOf(scan(list, name, ns, false)))
-                        << "seed " << seed << " op " << op << " find " << utf8(name) << " in '"
-                        << utf8(ns) << "'";
-                    ASSERT_EQ(idOf(list.findExact(name, ns)), idOf(scan(list, name, ns, true)))
-                        << "seed " << seed << " op " << op << " findExact " << utf8(name) << " in '"
-                        << utf8(ns) << "'";
-                }
-            }
+            for (const auto& name : names)
+                for (const auto& ns : spaces)
+                    for (bool exact : {false, true})
+                        ASSERT_EQ(idOf(exact ? list.findExact(name, ns) : list.find(name, ns)),
+                                  idOf(scan(list, name, ns, exact)))
+                            << "seed " << seed << " op " << op << " " << utf8(name) << " in '"
+                            << utf8(ns) << "', exact " << exact;
         }
     }
 }
