@@ -24,12 +24,13 @@ struct RecordCase {
     const char* schemaAttrs = "";
 };
 
-// Two nested records named x under different parents, and a type that meets itself
-// two records down.
+// Two nested records named x under different parents, one holding a record three
+// deep, and a type that meets itself two records down.
 constexpr const char* kTwoX = R"(<xs:element name="r"><xs:complexType><xs:sequence>
           <xs:element name="a"><xs:complexType><xs:sequence>
-            <xs:element name="x"><xs:complexType><xs:sequence>
-              <xs:element name="p" type="xs:int"/></xs:sequence></xs:complexType></xs:element>
+            <xs:element name="x"><xs:complexType><xs:sequence><xs:element name="w">
+              <xs:complexType><xs:sequence><xs:element name="p" type="xs:int"/></xs:sequence>
+              </xs:complexType></xs:element></xs:sequence></xs:complexType></xs:element>
           </xs:sequence></xs:complexType></xs:element>
           <xs:element name="b"><xs:complexType><xs:sequence>
             <xs:element name="x"><xs:complexType><xs:sequence>
@@ -186,7 +187,8 @@ const RecordCase kCases[] = {
     {"SameNameSharesFirstRecord", kTwoX,
      "r(0): a Record(2) notnull, b Record(2) notnull\n"
      "a(0): x Record(2) notnull\n"
-     "x(0): p int(48) 0/10/0\n"
+     "x(0): w Record(2) notnull\n"
+     "w(0): p int(48) 0/10/0\n"
      "b(0): x Record(2) notnull\n"
      "top(0): part Record(2) notnull\n"
      "part(0): sub Record(2) notnull\n"
@@ -195,7 +197,8 @@ const RecordCase kCases[] = {
     {"QualifiedNamesKeepDistinctRecords", kTwoX,
      "r(0): a Record(2) notnull, b Record(2) notnull\n"
      "a(0): [a]x Record(2) notnull\n"
-     "[a]x(0): p int(48) 0/10/0\n"
+     "[a]x(0): [a!x]w Record(2) notnull\n"
+     "[a!x]w(0): p int(48) 0/10/0\n"
      "b(0): [b]x Record(2) notnull\n"
      "[b]x(0): q int(48) 0/10/0\n"
      "top(0): part Record(2) notnull\n"
