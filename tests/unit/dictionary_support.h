@@ -10,25 +10,29 @@
 
 namespace zrtest {
 
-// One line per record, "name(length):", then one indented line per field,
-// "name: alias(usage) length/precision/decimals null|notnull", and its description
-// in quotes when it has one.
+// One line per record: "name(length):", then its fields separated by ", ", each
+// "name alias(usage)" with " length/precision/decimals" when any is non-zero,
+// " notnull" when it takes no nulls, and its description in quotes when it has one.
 inline std::string dumpRecords(const ZrRecordList& records) {
     std::string out;
     for (int r = 0; r < records.Count(); ++r) {
         const ZrRecord* record = records[r];
-        out += utf8(record->name) + "(" + std::to_string(record->RecordLength()) + "):\n";
+        out += utf8(record->name) + "(" + std::to_string(record->RecordLength()) + "):";
         for (int f = 0; f < record->FieldCount(); ++f) {
             const ZrField* field = record->GetFieldbyPos(f);
             const ZrDType& type = field->DataType();
-            out += "  " + utf8(field->FieldName()) + ": " + type.Alias() + "(" +
-                   std::to_string(type.Usage()) + ") " + std::to_string(type.Length()) + "/" +
-                   std::to_string(type.Precision()) + "/" + std::to_string(type.DecimalPlaces()) +
-                   (type.Nulls() ? " null" : " notnull");
+            out += std::string(f ? ", " : " ") + utf8(field->FieldName()) + " " + type.Alias() +
+                   "(" + std::to_string(type.Usage()) + ")";
+            if (type.Length() || type.Precision() || type.DecimalPlaces())
+                out += " " + std::to_string(type.Length()) + "/" +
+                       std::to_string(type.Precision()) + "/" +
+                       std::to_string(type.DecimalPlaces());
+            if (!type.Nulls())
+                out += " notnull";
             if (*field->Description())
                 out += std::string(" \"") + field->Description() + "\"";
-            out += "\n";
         }
+        out += "\n";
     }
     return out;
 }

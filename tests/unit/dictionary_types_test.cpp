@@ -3,7 +3,9 @@
 #include "BuiltinTypes.h"
 #include "TestSupport.h"
 
+#include <algorithm>
 #include <gtest/gtest.h>
+#include <sstream>
 #include <string>
 #include <vector>
 
@@ -51,19 +53,14 @@ Text;base64Binary attribute;321
 )";
 
 std::vector<std::string> expectedEntries() {
+    std::string text = kExpected;
+    std::replace(text.begin(), text.end(), '\n', '|');
+    std::istringstream in(text);
     std::vector<std::string> out;
-    std::string entry;
-    for (const char* c = kExpected;; ++c) {
-        if (*c == '|' || *c == '\n' || *c == '\0') {
-            if (const size_t from = entry.find_first_not_of(' '); from != std::string::npos)
-                out.push_back(entry.substr(from, entry.find_last_not_of(' ') + 1 - from));
-            entry.clear();
-            if (!*c)
-                return out;
-        } else {
-            entry += *c;
-        }
-    }
+    for (std::string entry; std::getline(in, entry, '|');)
+        if (const size_t from = entry.find_first_not_of(' '); from != std::string::npos)
+            out.push_back(entry.substr(from, entry.find_last_not_of(' ') + 1 - from));
+    return out;
 }
 
 std::string describe(const ZrDType& t) {
