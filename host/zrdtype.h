@@ -10,7 +10,7 @@
 #include <vector>
 
 class ZRHOST_API ZrDType {
-public:
+  public:
     // The parsed definition string: the class word, then each item as written
     // (key and value for "key=value", key alone for a bare word; single quotes
     // around a value are removed). Shared by every copy of a type.
@@ -35,18 +35,29 @@ public:
     bool Define(const char* definition);
 
     short Usage() const { return usage_; }
+
     void Usage(short usage) { usage_ = usage; }
+
     // Never null; "" for an undefined type.
     const char* Alias() const { return alias_.c_str(); }
+
     // A null alias sets the empty text.
     void Alias(const char* alias) { alias_.assign(alias ? alias : ""); }
+
     long Length() const { return length_; }
+
     void Length(long length) { length_ = length; }
+
     long Precision() const { return precision_; }
+
     void Precision(long precision) { precision_ = precision; }
+
     short DecimalPlaces() const { return decimals_; }
+
     void DecimalPlaces(short decimals) { decimals_ = decimals; }
+
     bool Nulls() const { return nulls_; }
+
     void Nulls(bool nulls) { nulls_ = nulls; }
 
     // Inspection for host programs.
@@ -56,9 +67,10 @@ public:
     const char* DefinitionText() const;
     // The value of item `key` ("" for a bare word), or null when the definition lacks it.
     const char* Item(const char* key) const;
+
     const Definition* Parsed() const { return def_.get(); }
 
-private:
+  private:
     std::shared_ptr<const Definition> def_;
     std::string alias_;
     long length_ = 0;

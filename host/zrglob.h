@@ -11,7 +11,7 @@
 using ZrLogSink = std::function<void(int severity, int code, const std::u16string& text)>;
 
 class ZRHOST_API ZrGlob {
-public:
+  public:
     // printf-style logging. Narrow formats: %s is narrow (UTF-8) text, %S wide text.
     // Wide formats: %s is wide text, %S narrow text. Both: %d an int, %ld a long,
     // %u an unsigned int, %c a character, %% a percent sign. A null text argument
@@ -48,7 +48,7 @@ public:
 };
 
 class ZRHOST_API ZrXmlUtils {
-public:
+  public:
     // Copies parser text into `out`; a null text gives "". `trim` strips leading and
     // trailing XML blanks (space, tab, CR, LF).
     static void XMLChToWchar(const ZrWChar* text, ZrWString& out, bool trim);

@@ -1,12 +1,13 @@
 #!/usr/bin/env bash
-# Installs what is missing, then builds and runs the whole test suite twice: once
-# with warnings as errors, once under the address and undefined-behaviour
-# sanitizers; last, the threaded test of the unit tests under ThreadSanitizer.
-# Stops at the first failure.
+# Installs what is missing, checks the C++ layout, then builds and runs the whole
+# test suite twice: once with warnings as errors, once under the address and
+# undefined-behaviour sanitizers; last, the threaded test of the unit tests under
+# ThreadSanitizer. Stops at the first failure.
 set -euo pipefail
 source "$(dirname "${BASH_SOURCE[0]}")/setup.sh"
 
 zr_install_packages
+zr_check_format
 
 werror="$ZR_ROOT/build/werror"
 zr_build "$werror" -DCMAKE_BUILD_TYPE=RelWithDebInfo -DZR_WERROR=ON

@@ -41,3 +41,12 @@ zr_build() {
     echo "== build $dir"
     cmake --build "$dir" -j "$ZR_JOBS"
 }
+
+# zr_check_format: fails naming every tracked C++ file that .clang-format would lay
+# out differently.
+zr_check_format() {
+    echo "== format ($(clang-format --version))"
+    local files
+    mapfile -t files < <(git -C "$ZR_ROOT" ls-files '*.cpp' '*.h')
+    (cd "$ZR_ROOT" && clang-format --dry-run -Werror "${files[@]}")
+}

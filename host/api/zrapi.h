@@ -13,7 +13,7 @@
 
 // A connector. Plug-ins only ask it to translate data types.
 class ZRHOST_API ZrSpoke {
-public:
+  public:
     virtual ~ZrSpoke() = default;
     // The connector's own type for `type`; this base returns a copy.
     virtual ZrDType MapDataType(const ZrDType& type);
@@ -22,24 +22,33 @@ public:
 enum VALIDTYPE : int { ZR_VALID = 0, ZR_INVALID = 1 };
 
 class ZRHOST_API ZrField {
-public:
+  public:
     explicit ZrField(const ZrDType& type);
     ZrField(const ZrField&) = default;
     ZrField& operator=(const ZrField&) = default;
     virtual ~ZrField();
 
     ZrDType& DataType() { return type_; }
+
     const ZrDType& DataType() const { return type_; }
+
     void FieldName(const ZrWString& name) { name_ = name; }
+
     void FieldName(ZrWString&& name) { name_ = std::move(name); }
+
     const ZrWString& FieldName() const { return name_; }
+
     void Alias(const ZrWString& alias) { alias_ = alias; }
+
     const ZrWString& Alias() const { return alias_; }
+
     // A null description sets the empty text.
     void Description(const char* text);
+
     // One text often describes many fields (a type's documentation), and records are
     // copied whole: a shared text is held once, however many fields and copies use it.
     void Description(std::shared_ptr<const std::string> text) { description_ = std::move(text); }
+
     const char* Description() const { return description_ ? description_->c_str() : ""; }
 
     // One line "name alias(usage)" describing the field.
@@ -58,7 +67,7 @@ public:
     // A copy of the same dynamic type; used when records are copied.
     virtual ZrField* Clone() const;
 
-private:
+  private:
     ZrDType type_;
     ZrWString name_;
     ZrWString alias_;
@@ -67,7 +76,7 @@ private:
 };
 
 class ZRHOST_API ZrRecord {
-public:
+  public:
     // The record's name; assigned and read directly.
     ZrWString name;
 
@@ -79,7 +88,9 @@ public:
     virtual ~ZrRecord();
 
     int FieldCount() const { return static_cast<int>(fields_.size()); }
+
     long RecordLength() const { return recordLength_; }
+
     void RecordLength(long length) { recordLength_ = length; }
 
     // Appends a field holding copies of `type` and `name`; returns it.
@@ -95,20 +106,22 @@ public:
     // still owns.
     bool AppendField(ZrField* field);
 
-private:
+  private:
     std::vector<std::unique_ptr<ZrField>> fields_;
     long recordLength_ = 0;
 };
 
 class ZRHOST_API ZrRecordList {
-public:
+  public:
     ZrRecordList() = default;
     ZrRecordList(const ZrRecordList& other);
     ZrRecordList& operator=(const ZrRecordList& other);
     virtual ~ZrRecordList();
 
     void Clear() { records_.clear(); }
+
     int Count() const { return static_cast<int>(records_.size()); }
+
     // Null when out of range.
     ZrRecord* operator[](int pos) const;
     // First record of exactly that name, or null.
@@ -122,7 +135,7 @@ public:
     // both lists unchanged, when memory runs out.
     void TakeAll(ZrRecordList& source);
 
-private:
+  private:
     std::vector<std::unique_ptr<ZrRecord>> records_;
 };
 
@@ -141,7 +154,7 @@ using ZrOptionWSetter = BATCHERR (*)(void* owner, const ZrWChar* value, bool& ch
                                      const ZrWChar* name);
 
 class ZRHOST_API ZrOptionDef {
-public:
+  public:
     ZrOptionDef(const ZrWChar* key, const ZrWChar* name, const ZrWChar* description, int flags,
                 const char* defaultValue, const ZrWChar* category, ZrOptionGetter getter,
                 ZrOptionSetter setter, ZrOptionWGetter wgetter, ZrOptionWSetter wsetter,
@@ -152,20 +165,32 @@ public:
     virtual ~ZrOptionDef();
 
     const ZrWString& Key() const { return key_; }
+
     const ZrWString& Name() const { return name_; }
+
     const ZrWString& Description() const { return description_; }
+
     const ZrString& DefaultValue() const { return defaultValue_; }
+
     int Flags() const { return flags_; }
+
     const OptionValueDef* Values() const { return values_; }
+
     int ValueCount() const { return valueCount_; }
+
     ZrOptionGetter Getter() const { return getter_; }
+
     ZrOptionSetter Setter() const { return setter_; }
+
     ZrOptionWGetter WGetter() const { return wgetter_; }
+
     ZrOptionWSetter WSetter() const { return wsetter_; }
+
     int Group() const { return group_; }
+
     long HelpId() const { return helpId_; }
 
-private:
+  private:
     ZrWString key_;
     ZrWString name_;
     ZrWString description_;
@@ -187,7 +212,7 @@ private:
 // Base of every dictionary browser. Holds the record list that the host reads after
 // a successful ReadDictionary, and the option machinery.
 class ZRHOST_API ZrDictBrowser {
-public:
+  public:
     // `typeDefinitions`: the plug-in's null-terminated array of type-definition
     // strings, kept by pointer (static storage).
     ZrDictBrowser(ZrSpoke* spoke, const char* const* typeDefinitions);
@@ -218,11 +243,14 @@ public:
     void InitOptions();
 
     ZrRecordList& RecordList() { return records_; }
+
     const ZrRecordList& RecordList() const { return records_; }
+
     const char* const* TypeDefinitions() const { return typeDefinitions_; }
+
     ZrSpoke* Spoke() const { return spoke_; }
 
-private:
+  private:
     ZrRecordList records_;
     ZrSpoke* spoke_;
     const char* const* typeDefinitions_;
