@@ -46,14 +46,46 @@ long patternPrecision(const std::string& pattern) {
 // unbounded ones, malformed ones (the scan ends inside the text and counts what it
 // read), and lengths that saturate at the largest 32-bit value.
 constexpr const char* kPatterns = R"(
-\d{3}-\d{4} 8   [A-Z]{2}(ab|cde)? 5   ab|cdef 4   ab| 2   (a|bc)(d|efg) 5   (ab){3} 6
-a{2,5} 5   a{,8} 8   a{5} 5   ab{1} 2   a?b? 2   [[a]b]c 2   \p{L}{3} 3   \P{Lu}x 2   \(\* 2
-((a|bb)c|d){2} 6
-a+ -   ab* -   x{2,} -   {0} -   abc|d+ -   (a|b*)c -   | -
-ab)c 4   a){3} 4   a|b))c 4   a\ 2   \p{L 1   a\p 2   [abc 1   (ab 2   (ab| 2   a( 1   a{3 -
-a{ -   a{x} -   (((( -
-a{99999999999} 2147483647   (a{99999999999}){99999999999} 2147483647
-a{4294967296}bc 2147483647
+\d{3}-\d{4}                   8
+[A-Z]{2}(ab|cde)?             5
+ab|cdef                       4
+ab|                           2
+(a|bc)(d|efg)                 5
+(ab){3}                       6
+a{2,5}                        5
+a{,8}                         8
+a{5}                          5
+ab{1}                         2
+a?b?                          2
+[[a]b]c                       2
+\p{L}{3}                      3
+\P{Lu}x                       2
+\(\*                          2
+((a|bb)c|d){2}                6
+a+                            -
+ab*                           -
+x{2,}                         -
+{0}                           -
+abc|d+                        -
+(a|b*)c                       -
+|                             -
+ab)c                          4
+a){3}                         4
+a|b))c                        4
+a\                            2
+\p{L                          1
+a\p                           2
+[abc                          1
+(ab                           2
+(ab|                          2
+a(                            1
+a{3                           -
+a{                            -
+a{x}                          -
+((((                          -
+a{99999999999}                2147483647
+(a{99999999999}){99999999999} 2147483647
+a{4294967296}bc               2147483647
 )";
 
 TEST(Pattern, Precision) {
@@ -120,13 +152,33 @@ TEST(PatternScan, RandomPatternsEndInsideTheirText) {
 // they give its precision and length: a lower bound alone gives none, as do types
 // whose values carry no digit count.
 constexpr const char* kLimits = R"(
-int 0 999 - - 3   int - - - 1000 3   int - - - 0 1   int -50 9 - - 2
-int -2147483648 0 - - 10   int - 0 -2147483648 - 10   long -99999999999 0 - - 10
-long - 99999999999 - - 10   int - 5 99 - 3   int 5 9 99999 - 1   int - 99 - - 2
-int - 1e5 - - 1   short - 123.456 - - 3   int@ 0 99 - - 2   normalizedString 0 999 - - 3
-token 0 999 - - 3   Character 0 12345 - - 5   positiveInteger 1 100 - - 3   int 1 - - - -
-nonNegativeInteger - - 0 - -   int - abc - - -   int 0 0 - - -   string 0 999 - - -
-string@ 0 999 - - -   decimal 0 999 - - -   date 0 999 - - -   hexBinary 0 999 - - -
+int                0            999         -           -    3
+int                -            -           -           1000 3
+int                -            -           -           0    1
+int                -50          9           -           -    2
+int                -2147483648  0           -           -    10
+int                -            0           -2147483648 -    10
+long               -99999999999 0           -           -    10
+long               -            99999999999 -           -    10
+int                -            5           99          -    3
+int                5            9           99999       -    1
+int                -            99          -           -    2
+int                -            1e5         -           -    1
+short              -            123.456     -           -    3
+int@               0            99          -           -    2
+normalizedString   0            999         -           -    3
+token              0            999         -           -    3
+Character          0            12345       -           -    5
+positiveInteger    1            100         -           -    3
+int                1            -           -           -    -
+nonNegativeInteger -            -           0           -    -
+int                -            abc         -           -    -
+int                0            0           -           -    -
+string             0            999         -           -    -
+string@            0            999         -           -    -
+decimal            0            999         -           -    -
+date               0            999         -           -    -
+hexBinary          0            999         -           -    -
 )";
 
 TEST(Limits, Digits) {
