@@ -12,7 +12,32 @@ ZrDType ZrSpoke::MapDataType(const ZrDType& type) { return type; }
 
 ZrField::ZrField(const ZrDType& type) : type_(type) {}
 
+ZrField::ZrField(const ZrField& other)
+    : type_(other.type_), name_(other.name_), description_(other.description_),
+      extras_(other.extras_ ? std::make_unique<Extras>(*other.extras_) : nullptr) {}
+
+ZrField& ZrField::operator=(const ZrField& other) {
+    if (this != &other) {
+        type_ = other.type_;
+        name_ = other.name_;
+        description_ = other.description_;
+        extras_ = other.extras_ ? std::make_unique<Extras>(*other.extras_) : nullptr;
+    }
+    return *this;
+}
+
 ZrField::~ZrField() = default;
+
+ZrField::Extras& ZrField::extras() {
+    if (!extras_)
+        extras_ = std::make_unique<Extras>();
+    return *extras_;
+}
+
+const ZrWString& ZrField::Alias() const {
+    static const ZrWString none;
+    return extras_ ? extras_->alias : none;
+}
 
 void ZrField::Description(const char* text) {
     if (text && *text)
@@ -46,12 +71,13 @@ void ZrField::StripBlanks() {
         s = ZrWString(v);
     };
     strip(name_);
-    strip(alias_);
+    if (extras_)
+        strip(extras_->alias);
 }
 
-const char* ZrField::EditPicture() const { return picture_.c_str(); }
+const char* ZrField::EditPicture() const { return extras_ ? extras_->picture.c_str() : ""; }
 
-void ZrField::EditPicture(const char* picture) { picture_ = picture; }
+void ZrField::EditPicture(const char* picture) { extras().picture = picture; }
 
 void ZrField::Save(ZrWString& out) const {
     ZrString narrow;

@@ -24,8 +24,8 @@ enum VALIDTYPE : int { ZR_VALID = 0, ZR_INVALID = 1 };
 class ZRHOST_API ZrField {
   public:
     explicit ZrField(const ZrDType& type);
-    ZrField(const ZrField&) = default;
-    ZrField& operator=(const ZrField&) = default;
+    ZrField(const ZrField& other);
+    ZrField& operator=(const ZrField& other);
     virtual ~ZrField();
 
     ZrDType& DataType() { return type_; }
@@ -38,9 +38,9 @@ class ZRHOST_API ZrField {
 
     const ZrWString& FieldName() const { return name_; }
 
-    void Alias(const ZrWString& alias) { alias_ = alias; }
+    void Alias(const ZrWString& alias) { extras().alias = alias; }
 
-    const ZrWString& Alias() const { return alias_; }
+    const ZrWString& Alias() const;
 
     // A null description sets the empty text.
     void Description(const char* text);
@@ -68,11 +68,19 @@ class ZRHOST_API ZrField {
     virtual ZrField* Clone() const;
 
   private:
+    // What few fields have: a dictionary of many thousands of fields holds one
+    // pointer each for them.
+    struct Extras {
+        ZrWString alias;
+        ZrString picture;
+    };
+
+    Extras& extras();
+
     ZrDType type_;
     ZrWString name_;
-    ZrWString alias_;
     std::shared_ptr<const std::string> description_;
-    ZrString picture_;
+    std::unique_ptr<Extras> extras_;
 };
 
 class ZRHOST_API ZrRecord {
