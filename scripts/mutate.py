@@ -20,6 +20,11 @@ one fails or times out, and the file is restored. The install tests and fuzz rep
 are left out: they exercise packaging and crash-freedom, which these faults do not
 touch. A run takes tens of minutes; it is a developer's tool, not part of CI.
 
+A fault may damage more than its own file (a file closed with the wrong flag may
+delete the document being read, a data file of the tests): so the tree must have no
+uncommitted change to tracked files, and after each fault every tracked file is
+checked out again, the damage named in the outcome.
+
 --out writes the sample and each outcome as JSON. --replay takes such a file and
 plants the same faults again, found by their line text (nearest to the recorded
 line), so that a suite can be measured before and after a change to the tests on
@@ -185,6 +190,12 @@ def run_suite(build_dir, timeout):
     return None
 
 
+def damaged_files():
+    out = subprocess.run(["git", "status", "--porcelain", "--untracked-files=no"], cwd=ROOT,
+                         check=True, capture_output=True, text=True).stdout
+    return [line[3:] for line in out.splitlines()]
+
+
 def try_site(site, build_dir, jobs, timeout):
     """Plants one fault; returns its outcome: caught, survived, no-build or gone."""
     path = os.path.join(ROOT, site["file"])
@@ -211,6 +222,10 @@ def try_site(site, build_dir, jobs, timeout):
     finally:
         with open(path, "w", encoding="utf-8") as f:
             f.write(original)
+        damaged = damaged_files()
+        if damaged:
+            subprocess.run(["git", "checkout", "--", *damaged], cwd=ROOT, check=True)
+            print(f"  restored what the fault damaged: {', '.join(damaged)}", flush=True)
 
 
 def main():
@@ -240,6 +255,10 @@ def main():
             print(f'{s["file"]}:{s["line"]}: {s["operator"]}: {s["text"].strip()}')
         return 0
 
+    if damaged_files():
+        print("commit or stash the changes to tracked files first: every tracked file is "
+              "checked out again after each fault", file=sys.stderr)
+        return 2
     if not os.path.exists(os.path.join(args.build_dir, "CMakeCache.txt")):
         subprocess.run(["cmake", "-S", ROOT, "-B", args.build_dir, "-DCMAKE_BUILD_TYPE=Debug",
                         "-DZR_BENCH=OFF"], check=True, stdout=subprocess.DEVNULL)
