@@ -17,13 +17,7 @@ struct RunResult {
     Json json() const;
 };
 
-// Runs zrdict (the built one, or `program`) with `args` in `workDir` (the current
-// directory when empty), with stdin from /dev/null.
+// Runs `program` (the built zrdict by default) with `args` in `workDir` (the
+// current directory when empty), with stdin from /dev/null.
 RunResult runZrdict(const std::vector<std::string>& args, const std::string& workDir = {},
-                    const std::string& program = {});
-
-// Locations fixed when the tests were built.
-std::string dataDir();         // tests/data
-std::string examplesDir();     // examples
-std::string pluginPath();      // the built libzrbxmls.so
-std::string utilLibraryPath(); // a shared library without the plug-in's entry points
+                    const std::string& program = ZRDICT_PATH);
