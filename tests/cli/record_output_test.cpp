@@ -3,6 +3,7 @@
 // the graph.
 #include "RecordOutput.h"
 
+#include <algorithm>
 #include <cerrno>
 #include <cstdlib>
 #include <gtest/gtest.h>
@@ -14,11 +15,9 @@ namespace {
 
 using Json = nlohmann::ordered_json;
 
-ZrDType makeType(const char* definition, long length = -1) {
+ZrDType makeType(const char* definition) {
     ZrDType type;
     type.Define(definition);
-    if (length >= 0)
-        type.Length(length);
     return type;
 }
 
@@ -45,21 +44,14 @@ std::vector<const ZrRecord*> all(const ZrRecordList& list) {
 
 // The document as zrdict built it with the document library.
 Json referenceRecord(const ZrRecord& record) {
-    Json out;
-    out["name"] = zrUtf16ToUtf8(record.name.view());
-    out["length"] = record.RecordLength();
     Json fields = Json::array();
     for (int i = 0; i < record.FieldCount(); ++i) {
         const ZrField* field = record.GetFieldbyPos(i);
         const ZrDType& type = field->DataType();
-        Json t;
-        t["class"] = type.TypeClass();
-        t["alias"] = type.Alias();
-        t["usage"] = type.Usage();
-        t["length"] = type.Length();
-        t["precision"] = type.Precision();
-        t["decimals"] = type.DecimalPlaces();
-        t["nulls"] = type.Nulls();
+        Json t = {{"class", type.TypeClass()},     {"alias", type.Alias()},
+                  {"usage", type.Usage()},         {"length", type.Length()},
+                  {"precision", type.Precision()}, {"decimals", type.DecimalPlaces()},
+                  {"nulls", type.Nulls()}};
         if (const char* maxLength = type.Item("maxlength")) {
             char* end = nullptr;
             errno = 0;
@@ -73,15 +65,14 @@ Json referenceRecord(const ZrRecord& record) {
             t["picture"] = picture;
         if (const char* isSigned = type.Item("signed"))
             t["signed"] = std::string(isSigned) == "true";
-        Json entry;
-        entry["name"] = zrUtf16ToUtf8(field->FieldName().view());
-        entry["alias"] = zrUtf16ToUtf8(field->Alias().view());
-        entry["description"] = field->Description();
-        entry["type"] = t;
-        fields.push_back(entry);
+        fields.push_back({{"name", zrUtf16ToUtf8(field->FieldName().view())},
+                          {"alias", zrUtf16ToUtf8(field->Alias().view())},
+                          {"description", field->Description()},
+                          {"type", t}});
     }
-    out["fields"] = fields;
-    return out;
+    return {{"name", zrUtf16ToUtf8(record.name.view())},
+            {"length", record.RecordLength()},
+            {"fields", fields}};
 }
 
 TEST(RecordDocument, SameBytesAsTheDocumentLibrary) {
@@ -116,16 +107,12 @@ TEST(RecordDocument, SameBytesAsTheDocumentLibrary) {
     std::ostringstream streamed;
     printRecordDocument(streamed, 0, all(list), messages);
 
-    Json doc;
-    doc["status"] = 0;
-    doc["records"] = Json::array();
+    Json doc = {{"status", 0}, {"records", Json::array()}, {"messages", Json::array()}};
     for (const ZrRecord* record : all(list))
         doc["records"].push_back(referenceRecord(*record));
-    Json logged = Json::array();
     for (const LoggedMessage& message : messages)
-        logged.push_back(
+        doc["messages"].push_back(
             {{"severity", message.severity}, {"code", message.code}, {"text", message.text}});
-    doc["messages"] = logged;
     EXPECT_EQ(streamed.str(), doc.dump(2, ' ', false, Json::error_handler_t::replace) + "\n");
 
     std::ostringstream failed;
@@ -216,15 +203,10 @@ TEST(RecordTree, DeepNestingKeepsLinesShort) {
         addRecord(list, zrUtf8ToUtf16("r" + std::to_string(i)), fields);
     }
     const std::string out = tree(list, all(list));
-    size_t lines = 0;
     size_t longest = 0;
-    for (size_t start = 0; start < out.size();) {
-        const size_t end = out.find('\n', start);
+    for (size_t start = 0, end; (end = out.find('\n', start)) != std::string::npos; start = end + 1)
         longest = std::max(longest, end - start);
-        ++lines;
-        start = end + 1;
-    }
-    EXPECT_EQ(lines, 1u + 2u * depth - 1u);
+    EXPECT_EQ(std::count(out.begin(), out.end(), '\n'), 2 * depth);
     EXPECT_LT(longest, 300u);
     EXPECT_NE(out.find("[20000] v: string"), std::string::npos);
 }
