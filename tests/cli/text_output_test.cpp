@@ -25,28 +25,17 @@ template <class Text> std::string escaped(const Text& text) {
 }
 
 TEST(Utf8Escaping, MatchesTheDocumentLibrary) {
-    const std::string cases[] = {
-        "order_1 + x",
-        "a\"b\\c/",
-        "\b\t\n\f\r",
-        std::string("\0\x01\x1f\x0b", 4),
-        "\x7f",
-        "\xc3\xa9\xe2\x82\xac\xf0\x9f\x98\x80", // two, three and four bytes
-        "\xf4\x8f\xbf\xbf",                     // the highest code point
-        "a\x80z",
-        "\x80\xbf",         // stray continuations
-        "\xc0\xaf\xf5\xff", // bytes that lead nothing
-        "\xe0\x80\xaf",
-        "\xed\xa0\x80",     // overlong, an encoded surrogate
-        "\xf4\x90\x80\x80", // beyond Unicode
-        "\xe2\x82z",
-        "\xf0\x9f\x98\"",
-        "\xe2\xc3\xa9",
-        "ab\xf0\x9f\x98", // cut short
-    };
-    for (const std::string& text : cases)
-        EXPECT_EQ(escaped(text), referenceEscape(text)) << ::testing::PrintToString(text);
-    EXPECT_EQ(escaped(std::string("\x01\"\xe2\x82z")), "\\u0001\\\"\xef\xbf\xbdz");
+    // Escapes; two, three and four bytes and the highest code point; stray
+    // continuations, bytes that lead nothing, overlong forms, an encoded surrogate,
+    // beyond Unicode; sequences cut short by ASCII, a quote, a new lead, the end.
+    for (const char* text :
+         {"order_1 + x", "a\"b\\c/", "\b\t\n\f\r", "\x01\x1f\x0b", "\x7f",
+          "\xc3\xa9\xe2\x82\xac\xf0\x9f\x98\x80", "\xf4\x8f\xbf\xbf", "a\x80z", "\x80\xbf",
+          "\xc0\xaf\xf5\xff", "\xe0\x80\xaf", "\xed\xa0\x80", "\xf4\x90\x80\x80", "\xe2\x82z",
+          "\xf0\x9f\x98\"", "\xe2\xc3\xa9", "ab\xf0\x9f\x98"})
+        EXPECT_EQ(escaped(std::string(text)), referenceEscape(text))
+            << ::testing::PrintToString(text);
+    EXPECT_EQ(escaped(std::string("\0\x01\"\xe2\x82z", 6)), "\\u0000\\u0001\\\"\xef\xbf\xbdz");
 
     // Random bytes, weighted towards lead and continuation bytes so that
     // well-formed and ill-formed sequences of every length turn up.
@@ -65,17 +54,16 @@ TEST(Utf8Escaping, MatchesTheDocumentLibrary) {
 // 16-bit text from the plug-in goes straight to the output: the same bytes as
 // converting it first (the host's conversion) and escaping the result.
 TEST(Utf16Escaping, MatchesConversionThenEscaping) {
-    const std::u16string cases[] = {
-        u"plain",
-        u"caf\u00e9 \u20ac",
-        u"\U0001F600 non-BMP",
-        std::u16string(1, u'\0') + u"\t\x1f\"\\",
-        std::u16string{0xD83D},                 // high surrogate at the end
-        std::u16string{0xDE00, u'a'},           // low surrogate alone
-        std::u16string{0xD83D, 0xD83D, 0xDE00}, // high, then a whole pair
-        std::u16string{0xD83D, u'x', 0xDE00},
-        std::u16string{0xFFFF, 0xFFFE},
-    };
+    // A high surrogate at the end, a low one alone, a high one before a whole pair or
+    // before ASCII.
+    const std::u16string cases[] = {u"plain",
+                                    u"caf\u00e9 \u20ac \U0001F600",
+                                    std::u16string(1, u'\0') + u"\t\x1f\"\\",
+                                    u"a\xD83D",
+                                    u"\xDE00-",
+                                    u"\xD83D\xD83D\xDE00",
+                                    u"\xD83Dx\xDE00",
+                                    u"\xFFFF\xFFFE"};
     for (const std::u16string& text : cases) {
         const std::string viaHost = zrUtf16ToUtf8(text);
         EXPECT_EQ(escaped(text), referenceEscape(viaHost)) << ::testing::PrintToString(viaHost);

@@ -4,7 +4,6 @@
 #include <cstdio>
 #include <cstring>
 #include <fcntl.h>
-#include <gtest/gtest.h>
 #include <spawn.h>
 #include <stdexcept>
 #include <sys/wait.h>
@@ -60,15 +59,4 @@ RunResult runZrdict(const std::vector<std::string>& args, const std::string& wor
     result.out = drain(out);
     result.err = drain(err);
     return result;
-}
-
-Json RunResult::json() const {
-    try {
-        return Json::parse(out);
-    } catch (const Json::parse_error& e) {
-        ADD_FAILURE() << "stdout is not one JSON document (" << e.what() << ")\nstdout:\n"
-                      << out << "\nstderr:\n"
-                      << err;
-        return Json();
-    }
 }

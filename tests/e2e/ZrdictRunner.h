@@ -11,10 +11,6 @@ struct RunResult {
     int exitStatus = -1; // the exit status, or 128 + the signal that ended the process
     std::string out;
     std::string err;
-
-    // stdout parsed as exactly one JSON document; a null document (and a test
-    // failure naming the output) when it is not one.
-    Json json() const;
 };
 
 // Runs `program` (the built zrdict by default) with `args` in `workDir` (the

@@ -13,14 +13,6 @@
 
 namespace {
 
-ZrDType numberType(long length) {
-    ZrDType type;
-    type.Define("Number;alias=int;signed_invalid;display;maxlength=32;precision=10;"
-                "scale_invalid;usage=48");
-    type.Length(length);
-    return type;
-}
-
 // Translates every type to text of its own choosing, length included; call
 // `failAt` throws what `failure` names.
 class TextSpoke : public ZrSpoke {
@@ -44,13 +36,16 @@ class TextSpoke : public ZrSpoke {
     const char* failure = "";
 };
 
+// Fields f0, f1, ... of the given lengths, each with an alias and a description.
 ZrRecord sourceRecord(const std::vector<long>& lengths) {
     ZrRecord record;
     record.name = u"source";
-    int n = 0;
     for (long length : lengths) {
-        const std::u16string name = u"f" + std::u16string(1, char16_t(u'0' + n++));
-        ZrField* field = record.NewField(numberType(length), ZrWString(name));
+        ZrDType type;
+        type.Define("Number;alias=int;precision=10;usage=48");
+        type.Length(length);
+        ZrField* field =
+            record.NewField(type, u"f" + std::u16string(1, u'0' + record.FieldCount()));
         field->Alias(u"own alias");
         field->Description(("described " + std::to_string(length)).c_str());
     }
