@@ -44,8 +44,8 @@ ZrRecord sourceRecord(const std::vector<long>& lengths) {
         ZrDType type;
         type.Define("Number;alias=int;precision=10;usage=48");
         type.Length(length);
-        ZrField* field =
-            record.NewField(type, u"f" + std::u16string(1, u'0' + record.FieldCount()));
+        const std::u16string name = u"f" + std::u16string(1, u'0' + record.FieldCount());
+        ZrField* field = record.NewField(type, ZrWString(name));
         field->Alias(u"own alias");
         field->Description(("described " + std::to_string(length)).c_str());
     }
