@@ -1,8 +1,7 @@
 // Every tests/data/e2e/<name>.xsd with a sibling <name>.expected.json is one case:
 // zrdict reads the schema with JSON output and must print exactly the expected
-// document. <name>.args, when present, holds extra arguments one per line (blank
-// lines and lines starting with '#' are skipped); a first line naming another
-// subcommand ("flatten") replaces "read". The schema path always follows
+// document. <name>.args, when present, holds extra arguments one per line; a first
+// line naming another subcommand ("flatten") replaces "read". The schema path always follows
 // "--format json", the rest after it, e.g. for flatten the record's name.
 //
 // zrdict runs inside the data directory with a relative schema path, so the paths
@@ -45,21 +44,14 @@ std::string readFile(const fs::path& path) {
 }
 
 std::vector<std::string> commandLine(const std::string& name, const std::string& format) {
-    std::vector<std::string> extra;
+    std::vector<std::string> args = {"read", "--format", format, name + ".xsd"};
     std::istringstream lines(readFile(kCaseDir / (name + ".args")));
     for (std::string line; std::getline(lines, line);) {
-        if (!line.empty() && line.back() == '\r')
-            line.pop_back();
-        if (!line.empty() && line.front() != '#')
-            extra.push_back(line);
+        if (line == "flatten" && args.size() == 4)
+            args[0] = line;
+        else
+            args.push_back(line);
     }
-    std::string command = "read";
-    if (!extra.empty() && extra.front() == "flatten") {
-        command = extra.front();
-        extra.erase(extra.begin());
-    }
-    std::vector<std::string> args = {command, "--format", format, name + ".xsd"};
-    args.insert(args.end(), extra.begin(), extra.end());
     return args;
 }
 

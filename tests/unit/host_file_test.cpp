@@ -50,12 +50,7 @@ TEST(HostFile, RefusesWhatIsNotALocalRegularFile) {
     const std::string fifo = (dir.path() / "pipe").string();
     ASSERT_EQ(mkfifo(fifo.c_str(), 0600), 0);
 
-    struct Refusal {
-        std::string name;
-        const char* mode;
-    };
-
-    const Refusal refusals[] = {
+    const std::pair<std::string, const char*> refusals[] = {
         {(dir.path() / "missing.xsd").string(), "rb"},
         {dir.path().string(), "rb"}, // a directory
         {fifo, "rb"},                // would block a plain open
@@ -64,12 +59,12 @@ TEST(HostFile, RefusesWhatIsNotALocalRegularFile) {
         {"", "rb"},
         {file, "wb"}, // reading only
     };
-    for (const auto& r : refusals) {
+    for (const auto& [name, mode] : refusals) {
         ZrFileProxy proxy;
-        EXPECT_EQ(proxy.openfile(r.name.c_str(), r.mode, ZR_CSET_FILESYSTEM), -1) << r.name;
-        EXPECT_FALSE(proxy.isOpen()) << r.name;
+        EXPECT_EQ(proxy.openfile(name.c_str(), mode, ZR_CSET_FILESYSTEM), -1) << name;
+        EXPECT_FALSE(proxy.isOpen()) << name;
         char buffer[4];
-        EXPECT_EQ(proxy.read(buffer, sizeof buffer), -1) << r.name;
+        EXPECT_EQ(proxy.read(buffer, sizeof buffer), -1) << name;
     }
     ZrFileProxy proxy;
     EXPECT_EQ(proxy.openfile(nullptr, "rb", ZR_CSET_FILESYSTEM), -1);
