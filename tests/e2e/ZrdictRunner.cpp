@@ -1,62 +1,46 @@
 #include "ZrdictRunner.h"
 
-#include <cerrno>
-#include <cstdio>
-#include <cstring>
-#include <fcntl.h>
-#include <spawn.h>
-#include <stdexcept>
+#include <cstdlib>
+#include <filesystem>
+#include <fstream>
+#include <sstream>
 #include <sys/wait.h>
-
-extern char** environ;
+#include <unistd.h>
 
 namespace {
 
-// Output goes to unlinked temporary files: no pipe can fill while the child runs.
-std::string drain(FILE* file) {
-    std::rewind(file);
-    std::string text;
-    char buffer[65536];
-    for (size_t n; (n = std::fread(buffer, 1, sizeof buffer, file)) > 0;)
-        text.append(buffer, n);
-    std::fclose(file);
-    return text;
+std::string quoted(const std::string& text) {
+    std::string out = "'";
+    for (char c : text)
+        out += c == '\'' ? std::string("'\\''") : std::string(1, c);
+    return out + "'";
+}
+
+std::string slurp(const std::string& path) {
+    std::ostringstream text;
+    text << std::ifstream(path, std::ios::binary).rdbuf();
+    std::filesystem::remove(path);
+    return text.str();
 }
 
 } // namespace
 
+// The shell only redirects and then becomes the program, so the status is its own.
 RunResult runZrdict(const std::vector<std::string>& args, const std::string& workDir,
                     const std::string& program) {
-    std::vector<std::string> argvStrings{program};
-    argvStrings.insert(argvStrings.end(), args.begin(), args.end());
-    std::vector<char*> argv;
-    for (std::string& arg : argvStrings)
-        argv.push_back(arg.data());
-    argv.push_back(nullptr);
-
-    FILE* out = std::tmpfile();
-    FILE* err = std::tmpfile();
-    if (!out || !err)
-        throw std::runtime_error("no temporary file for zrdict's output");
-    posix_spawn_file_actions_t actions;
-    posix_spawn_file_actions_init(&actions);
-    posix_spawn_file_actions_addopen(&actions, 0, "/dev/null", O_RDONLY, 0);
-    posix_spawn_file_actions_adddup2(&actions, fileno(out), 1);
-    posix_spawn_file_actions_adddup2(&actions, fileno(err), 2);
-    if (!workDir.empty())
-        posix_spawn_file_actions_addchdir_np(&actions, workDir.c_str());
-    pid_t pid = 0;
-    const int rc = posix_spawn(&pid, argv[0], &actions, nullptr, argv.data(), environ);
-    posix_spawn_file_actions_destroy(&actions);
-    if (rc != 0)
-        throw std::runtime_error(std::string("cannot run ") + argv[0] + ": " + std::strerror(rc));
-
+    static int runs = 0;
+    const std::string base = (std::filesystem::temp_directory_path() /
+                              ("zre2e-" + std::to_string(getpid()) + "-" + std::to_string(runs++)))
+                                 .string();
+    std::string command = workDir.empty() ? "exec " : "cd " + quoted(workDir) + " && exec ";
+    command += quoted(program);
+    for (const std::string& arg : args)
+        command += " " + quoted(arg);
+    command += " </dev/null >" + quoted(base + ".out") + " 2>" + quoted(base + ".err");
+    const int status = std::system(command.c_str());
     RunResult result;
-    int status = 0;
-    while (waitpid(pid, &status, 0) < 0 && errno == EINTR) {
-    }
     result.exitStatus = WIFSIGNALED(status) ? 128 + WTERMSIG(status) : WEXITSTATUS(status);
-    result.out = drain(out);
-    result.err = drain(err);
+    result.out = slurp(base + ".out");
+    result.err = slurp(base + ".err");
     return result;
 }
