@@ -17,13 +17,18 @@ std::string quoted(const std::string& text) {
 }
 
 std::string slurp(const std::string& path) {
-    std::ostringstream text;
-    text << std::ifstream(path, std::ios::binary).rdbuf();
+    std::string text = readFile(path);
     std::filesystem::remove(path);
-    return text.str();
+    return text;
 }
 
 } // namespace
+
+std::string readFile(const std::string& path) {
+    std::ostringstream text;
+    text << std::ifstream(path, std::ios::binary).rdbuf();
+    return text.str();
+}
 
 // The shell only redirects and then becomes the program, so the status is its own.
 RunResult runZrdict(const std::vector<std::string>& args, const std::string& workDir,

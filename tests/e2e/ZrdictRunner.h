@@ -17,3 +17,6 @@ struct RunResult {
 // current directory when empty), with stdin from /dev/null.
 RunResult runZrdict(const std::vector<std::string>& args, const std::string& workDir = {},
                     const std::string& program = ZRDICT_PATH);
+
+// The whole of a file; empty when it cannot be read.
+std::string readFile(const std::string& path);

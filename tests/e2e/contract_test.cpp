@@ -4,9 +4,7 @@
 
 #include <algorithm>
 #include <filesystem>
-#include <fstream>
 #include <gtest/gtest.h>
-#include <sstream>
 
 namespace fs = std::filesystem;
 
@@ -123,8 +121,7 @@ std::string indented(const std::string& text) {
 // shows, and the plug-in's options come from the plug-in.
 TEST(Usage, HelpShowsAWorkedExampleAndThePluginsOptions) {
     const std::string schema = ZR_EXAMPLES_DIR "/order.xsd";
-    std::ostringstream text;
-    text << std::ifstream(schema).rdbuf();
+    const std::string text = readFile(schema);
     const RunResult tree = runZrdict({"read", "--format", "tree", schema});
     const RunResult tables = runZrdict({"read", schema});
     const std::string options = "--option NAME=VALUE ('zrdict options' shows their values):\n"
@@ -132,12 +129,12 @@ TEST(Usage, HelpShowsAWorkedExampleAndThePluginsOptions) {
 
     const RunResult help = runZrdict({"--help"});
     for (const std::string& part :
-         {indented(text.str()), "  $ zrdict read --format tree order.xsd\n" + indented(tree.out),
-          options, std::string("types")})
+         {indented(text), "  $ zrdict read --format tree order.xsd\n" + indented(tree.out), options,
+          std::string("types")})
         EXPECT_TRUE(contains(help.out, part)) << part << " in\n" << help.out;
     const RunResult readHelp = runZrdict({"read", "--help"});
     for (const std::string& part :
-         {indented(text.str()), "  $ zrdict read order.xsd\n" + indented(tables.out), options,
+         {indented(text), "  $ zrdict read order.xsd\n" + indented(tables.out), options,
           std::string("{text,json,tree,dot}")})
         EXPECT_TRUE(contains(readHelp.out, part)) << part << " in\n" << readHelp.out;
 
