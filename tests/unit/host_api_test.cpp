@@ -36,7 +36,7 @@ std::string dump(const ZrRecord& record) {
     return out;
 }
 
-TEST(HostRecord, CopyIsDeepAndIndependentLookupsAndAppend) {
+TEST(HostRecord, CopiesLookupsAndPlacesInRecordsAndLists) {
     ZrRecord original = makeRecord(u"order", {u"id", u"item"});
     original.RecordLength(7);
     original.GetFieldbyPos(0)->Alias(u"alias");
@@ -71,9 +71,7 @@ TEST(HostRecord, CopyIsDeepAndIndependentLookupsAndAppend) {
     EXPECT_FALSE(record.AppendField(nullptr));
     EXPECT_TRUE(record.AppendField(new ZrField(textType(9))));
     EXPECT_EQ(dump(record), "a=1;b=2;a=3;=9;");
-}
 
-TEST(HostRecordList, AddRecordCopiesAndPlaces) {
     ZrRecordList list;
     ZrRecord* empty = list.AddRecord(nullptr, -1);
     ASSERT_NE(empty, nullptr);
@@ -100,18 +98,19 @@ TEST(HostRecordList, AddRecordCopiesAndPlaces) {
     list.AddRecord(&back, -1);
     EXPECT_EQ(list[u"c"], list[3]) << "the first of two records with one name";
 
-    ZrRecordList copy(list);
+    ZrRecordList listCopy(list);
     list.Clear();
     EXPECT_EQ(list.Count(), 0);
-    ASSERT_EQ(copy.Count(), 5);
-    EXPECT_EQ(dump(*copy[u"b"]), "x=1;");
-    ZrRecordList assigned;
-    assigned = copy;
-    copy[u"b"]->name = u"renamed";
-    EXPECT_NE(assigned[u"b"], nullptr);
+    ASSERT_EQ(listCopy.Count(), 5);
+    EXPECT_EQ(dump(*listCopy[u"b"]), "x=1;");
+    ZrRecordList listAssigned;
+    listAssigned = listCopy;
+    listCopy[u"b"]->name = u"renamed";
+    EXPECT_NE(listAssigned[u"b"], nullptr);
 }
 
-// A browser with two options: one served by narrow callbacks, one by wide ones.
+// A browser with two options: one set by a narrow callback, one by a wide one;
+// neither can be read back (the plug-in's options are, through both kinds).
 class OptionBrowser : public ZrDictBrowser {
   public:
     OptionBrowser() : ZrDictBrowser(nullptr, kDefs) { InitOptions(); }
@@ -131,18 +130,8 @@ class OptionBrowser : public ZrDictBrowser {
         return *static_cast<OptionBrowser*>(static_cast<ZrDictBrowser*>(owner));
     }
 
-    static BATCHERR getNarrow(void* owner, ZrString& value, const ZrWChar*) {
-        value = self(owner).narrow.c_str();
-        return BE_OK;
-    }
-
     static BATCHERR setNarrow(void* owner, const char* value, bool&, const ZrWChar*) {
         self(owner).narrow = value;
-        return BE_OK;
-    }
-
-    static BATCHERR getWide(void* owner, ZrWString& value, const ZrWChar*) {
-        value = self(owner).wide.c_str();
         return BE_OK;
     }
 
@@ -152,10 +141,10 @@ class OptionBrowser : public ZrDictBrowser {
     }
 
     const ZrOptionDef narrowDef{
-        u"narrowoption", u"NarrowOption", u"narrow", 0, "Start", nullptr, getNarrow, setNarrow,
-        nullptr,         nullptr,         nullptr,   0, nullptr, nullptr, 0,         0};
+        u"narrowoption", u"NarrowOption", u"narrow", 0, "Start", nullptr, nullptr, setNarrow,
+        nullptr,         nullptr,         nullptr,   0, nullptr, nullptr, 0,       0};
     const ZrOptionDef wideDef{u"wideoption", u"WideOption", u"wide", 0,       "Grüße", nullptr,
-                              nullptr,       nullptr,       getWide, setWide, nullptr, 0,
+                              nullptr,       nullptr,       nullptr, setWide, nullptr, 0,
                               nullptr,       nullptr,       0,       0};
     mutable const ZrOptionDef* defs[3] = {&narrowDef, &wideDef, nullptr};
 };
@@ -175,14 +164,10 @@ TEST(HostOptions, DefaultsLookupsAndCallbacks) {
 
     EXPECT_EQ(browser.SetOption(u"NARROWOPTION", u"caf\u00E9"), BE_OK);
     EXPECT_EQ(browser.narrow, "café") << "the narrow setter gets UTF-8";
-    ZrWString value;
-    EXPECT_EQ(browser.GetOption(u"narrowOption", value), BE_OK);
-    EXPECT_EQ(value.str(), u"caf\u00E9");
-
     EXPECT_EQ(browser.SetOption(u"wideoption", u"\U0001F600"), BE_OK);
     EXPECT_EQ(browser.wide, u"\U0001F600");
-    EXPECT_EQ(browser.GetOption(u"WideOption", value), BE_OK);
-    EXPECT_EQ(value.str(), u"\U0001F600");
+    ZrWString value;
+    EXPECT_EQ(browser.GetOption(u"narrowOption", value), BE_INVALID_ARGUMENT);
 
     EXPECT_EQ(browser.SetOption(u"unknown", u"x"), BE_UNKNOWN_OPTION);
     EXPECT_EQ(browser.GetOption(u"unknown", value), BE_UNKNOWN_OPTION);

@@ -8,7 +8,7 @@
 
 namespace {
 
-TEST(HostDType, KeepsEveryItemInOrderAndRefusesEmptyDefinitions) {
+TEST(HostDType, DefinitionItemsSettersAndCopies) {
     ZrDType type;
     EXPECT_STREQ(type.TypeClass(), "");
     EXPECT_STREQ(type.Alias(), "");
@@ -39,10 +39,8 @@ TEST(HostDType, KeepsEveryItemInOrderAndRefusesEmptyDefinitions) {
     EXPECT_EQ(type.Usage(), 0);
     EXPECT_EQ(type.Length(), 0);
     EXPECT_EQ(type.DecimalPlaces(), 0);
-}
 
-TEST(HostDType, RedefineResetsSettersAndCopiesAreIndependent) {
-    ZrDType type;
+    // Redefining resets what the setters set; copies are independent.
     ASSERT_TRUE(type.Define(kBuiltinTypeDefinitions[7]));
     type.Length(40);
     type.Precision(3);

@@ -74,7 +74,7 @@ TEST(HostLog, SinkGetsSeverityAndCodeStderrOtherwise) {
     EXPECT_EQ(ZrGlob::SeverityWord(3), "severity 3");
 }
 
-TEST(HostGlob, CaseBlindCompare) {
+TEST(HostGlob, CaseBlindCompareAndTruthWords) {
     EXPECT_EQ(ZrGlob::wcscmpi(u"FaLsE", u"false"), 0);
     EXPECT_EQ(ZrGlob::wcscmpi(u"\u00C9t\u00C9", u"\u00E9t\u00E9"), 0);
     // The multiplication and division signs are not a case pair.
@@ -83,11 +83,9 @@ TEST(HostGlob, CaseBlindCompare) {
     EXPECT_LT(ZrGlob::wcscmpi(u"abc", u"ABD"), 0);
     EXPECT_GT(ZrGlob::wcscmpi(u"abcd", u"ABC"), 0);
     EXPECT_LT(ZrGlob::wcscmpi(nullptr, u"a"), 0);
-}
 
-// A value is true when, blanks aside and case-blind, it is one of the picture's true
-// words: its first, third, ... word.
-TEST(HostGlob, StrToBoolAndBack) {
+    // A value is true when, blanks aside and case-blind, it is one of the picture's true
+    // words: its first, third, ... word.
     const char* const tf = "True.False.true.false";
     for (const char* value : {"True", " true\t", "TRUE"})
         EXPECT_TRUE(ZrGlob::StrToBool(value, tf)) << value;

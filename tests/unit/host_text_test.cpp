@@ -40,9 +40,6 @@ TEST(HostText, Utf8DecodeReplacesBrokenSequences) {
 TEST(HostText, Utf16EncodeReplacesLoneSurrogates) {
     const char16_t high = 0xD83D, low = 0xDE00;
     const std::pair<std::u16string, std::string> cases[] = {
-        {u"abc", "abc"},
-        {u"\u00E9\u20AC", "\xC3\xA9\xE2\x82\xAC"},
-        {u"\U0001F600", "\xF0\x9F\x98\x80"},
         {std::u16string{u'a', high}, "a\xEF\xBF\xBD"},
         {std::u16string{low, u'-'}, "\xEF\xBF\xBD-"},
         {std::u16string{high, u'x'}, "\xEF\xBF\xBDx"},
@@ -56,7 +53,7 @@ TEST(HostText, Utf16EncodeReplacesLoneSurrogates) {
     }
 }
 
-TEST(HostText, LengthLimitedCopiesStopAtTerminator) {
+TEST(HostText, LengthLimitedCopiesAndTaggedSearch) {
     ZrWString w;
     EXPECT_EQ(w.Assign("abcdef", ZR_CSET_DEFAULT, 3).str(), u"abc");
     // A length past the terminator must not read beyond it.
@@ -73,9 +70,7 @@ TEST(HostText, LengthLimitedCopiesStopAtTerminator) {
     const ZrWString fromNull(static_cast<const ZrWChar*>(nullptr));
     EXPECT_TRUE(fromNull.empty());
     EXPECT_EQ(fromNull.c_str()[0], u'\0');
-}
 
-TEST(HostText, TaggedStringFindAndSubstr) {
     // The parser-diagnostic use: keep what follows "Message:".
     const ZrXString message(u"Fatal at 3 Message: bad tag", -1);
     const ZrXString marker("Message:", ZR_CSET_DEFAULT);
