@@ -9,7 +9,7 @@ namespace {
 
 // Each maximal broken run becomes one U+FFFD; the byte that broke a sequence
 // starts afresh.
-TEST(HostText, Utf8DecodeReplacesBrokenSequences) {
+TEST(HostText, ConversionsReplaceBrokenText) {
     const std::pair<std::string, std::u16string> cases[] = {
         {"abc", u"abc"},
         {"", u""},
@@ -35,17 +35,16 @@ TEST(HostText, Utf8DecodeReplacesBrokenSequences) {
     }
     const std::string text = "Grüße, 世界 \xF0\x9F\x98\x80 end";
     EXPECT_EQ(zrUtf16ToUtf8(zrUtf8ToUtf16(text)), text);
-}
 
-TEST(HostText, Utf16EncodeReplacesLoneSurrogates) {
+    // A lone surrogate becomes U+FFFD.
     const char16_t high = 0xD83D, low = 0xDE00;
-    const std::pair<std::u16string, std::string> cases[] = {
+    const std::pair<std::u16string, std::string> encodes[] = {
         {std::u16string{u'a', high}, "a\xEF\xBF\xBD"},
         {std::u16string{low, u'-'}, "\xEF\xBF\xBD-"},
         {std::u16string{high, u'x'}, "\xEF\xBF\xBDx"},
         {std::u16string{low, high}, "\xEF\xBF\xBD\xEF\xBF\xBD"},
     };
-    for (const auto& [utf16, utf8] : cases) {
+    for (const auto& [utf16, utf8] : encodes) {
         EXPECT_EQ(zrUtf16ToUtf8(utf16), utf8) << ::testing::PrintToString(utf8);
         ZrString s;
         s.Assign(utf16.c_str(), ZR_CSET_DEFAULT, static_cast<int>(utf16.size()));

@@ -68,7 +68,7 @@ std::string dump(const ZrRecord& record) {
 
 // A record length of 0 is the sum of the field lengths, saturating; any other is
 // kept.
-TEST(PluginFlatten, AppendsAndSetsLength) {
+TEST(PluginFlatten, CopiesFieldsAndSetsLength) {
     const struct {
         std::vector<long> targetLengths; // fields the target holds before the call
         long targetLength;               // its record length before the call
@@ -97,10 +97,8 @@ TEST(PluginFlatten, AppendsAndSetsLength) {
         EXPECT_EQ(target.RecordLength(), c.expected) << dump(target);
         EXPECT_EQ(target.FieldCount(), c.targetLengths.size() + c.sourceLengths.size());
     }
-}
 
-// Without a connector the type is copied whole; the field's alias becomes its name.
-TEST(PluginFlatten, WithoutConnectorCopiesTypeAndFieldsOnce) {
+    // Without a connector the type is copied whole; the field's alias becomes its name.
     ZrXmlSchemaDict dict(nullptr);
     ZrRecord source = sourceRecord({6});
     ZrDType& type = source.GetFieldbyPos(0)->DataType();
