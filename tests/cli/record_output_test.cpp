@@ -85,16 +85,13 @@ TEST(RecordDocument, SameBytesAsTheDocumentLibrary) {
         "Text;alias='odd max';maxlength=12x;usage=16",
         "Text;alias=huge;maxlength=99999999999999999999;signed=true;usage=16",
         "DateTime;alias='date\tattribute';picture='yyyy-mm-dd';picture=second;usage=313",
-        kString,
     };
-    int n = 0;
-    for (const char* definition : definitions) {
-        ZrField* field =
-            order->NewField(makeType(definition), ZrWString(u"f" + std::u16string(1, u'a' + n)));
+    for (int n = 0; n < 5; ++n) {
+        ZrField* field = order->NewField(makeType(definitions[n]),
+                                         ZrWString(u"f" + std::u16string(1, u'a' + n)));
         field->DataType().Nulls(n % 2 == 0);
         field->DataType().Precision(n * 1000);
         field->DataType().DecimalPlaces(static_cast<short>(-n));
-        ++n;
     }
     // Ill-formed text from the plug-in: a lone surrogate in a name, bytes that are
     // not UTF-8 and control characters in a description.
