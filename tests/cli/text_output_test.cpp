@@ -51,18 +51,13 @@ TEST(Escaping, MatchesTheDocumentLibraryAndTheHostsConversion) {
     }
 
     // 16-bit text from the plug-in goes straight to the output: the same bytes as
-    // converting it first (the host's conversion) and escaping the result.
-    // A high surrogate at the end, a low one alone, a high one before a whole pair or
-    // before ASCII.
-    const std::u16string cases[] = {u"plain",
-                                    u"caf\u00e9 \u20ac \U0001F600",
-                                    std::u16string(1, u'\0') + u"\t\x1f\"\\",
-                                    u"a\xD83D",
-                                    u"\xDE00-",
-                                    u"\xD83D\xD83D\xDE00",
-                                    u"\xD83Dx\xDE00",
-                                    u"\xFFFF\xFFFE"};
-    for (const std::u16string& text : cases) {
+    // converting it first (the host's conversion) and escaping the result. A high
+    // surrogate at the end, a low one alone, a high one before a whole pair or ASCII.
+    using namespace std::string_view_literals;
+    const std::u16string_view cases[] = {
+        u"plain",   u"caf\u00e9 \u20ac \U0001F600", u"\0\t\x1f\"\\"sv, u"a\xD83D",
+        u"\xDE00-", u"\xD83D\xD83D\xDE00",          u"\xD83Dx\xDE00",  u"\xFFFF\xFFFE"};
+    for (const std::u16string_view text : cases) {
         const std::string viaHost = zrUtf16ToUtf8(text);
         EXPECT_EQ(escaped(text), referenceEscape(viaHost)) << ::testing::PrintToString(viaHost);
         std::string converted;

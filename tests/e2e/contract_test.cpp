@@ -73,9 +73,6 @@ const Case kCases[] = {
     {"JsonMissingSchema", {"read", "--format=json"}, 2},
 };
 
-// Test listings show the row's label rather than its bytes.
-void PrintTo(const Case& c, std::ostream* out) { *out << c.name; }
-
 class Zrdict : public ::testing::TestWithParam<Case> {};
 
 TEST_P(Zrdict, ExitStatusAndOutputAsPromised) {
@@ -162,7 +159,6 @@ TEST(Options, JsonListsTheOptionsWithTheirValues) {
     EXPECT_EQ(values,
               "QualifiedRecordNames=False (False) SchemaCatalog=a.xml () DecimalDigits=False "
               "(False) OccurrenceNulls=True (False) FieldDescriptions=False (False) ");
-    EXPECT_EQ(got["messages"], Json::array());
 }
 
 // A copy of zrdict in a directory of its own looks for the plug-in beside itself

@@ -135,7 +135,6 @@ TEST(PluginFlatten, ConnectorTranslatesAndItsFailuresStayInside) {
     const ZrRecord source = sourceRecord({3, 0, 8});
     ZrRecord target;
     ASSERT_EQ(dict.FlattenDictRecord(&source, &target, &spoke), BE_OK);
-    EXPECT_EQ(spoke.calls, 3);
     EXPECT_EQ(dump(target), "(11) f0:Character=3 f1:Character=0 f2:Character=8");
     EXPECT_STREQ(target.GetFieldbyPos(1)->Description(), "described 0");
 
