@@ -136,7 +136,6 @@ TEST(Usage, HelpShowsAWorkedExampleAndThePluginsOptions) {
         EXPECT_TRUE(contains(readHelp.out, part)) << part << " in\n" << readHelp.out;
 
     const RunResult withoutPlugin = runZrdict({"--help", "--plugin", "/nonexistent/lib.so"});
-    EXPECT_EQ(withoutPlugin.exitStatus, 0);
     EXPECT_TRUE(contains(withoutPlugin.out, "Plug-in options: not listed, cannot load plug-in "
                                             "'/nonexistent/lib.so'"))
         << withoutPlugin.out;
@@ -191,7 +190,6 @@ TEST(PluginLookup, BesideTheProgramThenTheBuildTreeListingItsTypes) {
     EXPECT_EQ(beside.exitStatus, 3);
     EXPECT_TRUE(contains(beside.err, (dir / "libzrbxmls.so").string())) << beside.err;
     EXPECT_TRUE(contains(beside.err, "NewBrowser")) << beside.err;
-    EXPECT_EQ(beside.out, "");
     const RunResult text = runZrdict({"types", "--plugin", ZRBXMLS_PATH}, {}, copy);
     EXPECT_EQ(text.exitStatus, 0);
     EXPECT_EQ(std::count(text.out.begin(), text.out.end(), '\n'), 96) << "a heading and 95 types";
