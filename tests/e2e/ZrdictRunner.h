@@ -11,19 +11,12 @@ struct RunResult {
     int exitStatus = -1; // the exit status, or 128 + the signal that ended the process
     std::string out;
     std::string err;
-
-    // stdout parsed as exactly one JSON document; a null document (and a test
-    // failure naming the output) when it is not one.
-    Json json() const;
 };
 
-// Runs zrdict (the built one, or `program`) with `args` in `workDir` (the current
-// directory when empty), with stdin from /dev/null.
+// Runs `program` (the built zrdict by default) with `args` in `workDir` (the
+// current directory when empty), with stdin from /dev/null.
 RunResult runZrdict(const std::vector<std::string>& args, const std::string& workDir = {},
-                    const std::string& program = {});
+                    const std::string& program = ZRDICT_PATH);
 
-// Locations fixed when the tests were built.
-std::string dataDir();         // tests/data
-std::string examplesDir();     // examples
-std::string pluginPath();      // the built libzrbxmls.so
-std::string utilLibraryPath(); // a shared library without the plug-in's entry points
+// The whole of a file; empty when it cannot be read.
+std::string readFile(const std::string& path);

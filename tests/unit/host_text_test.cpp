@@ -7,85 +7,52 @@
 
 namespace {
 
-struct DecodeCase {
-    const char* name;
-    std::string utf8;
-    std::u16string utf16;
-};
-
 // Each maximal broken run becomes one U+FFFD; the byte that broke a sequence
 // starts afresh.
-const DecodeCase kDecodeCases[] = {
-    {"Ascii", "abc", u"abc"},
-    {"Empty", "", u""},
-    {"TwoBytes", "\xC3\xA9", u"\u00E9"},
-    {"ThreeBytes", "\xE2\x82\xAC", u"\u20AC"},
-    {"FourBytes", "\xF0\x9F\x98\x80", u"\U0001F600"},
-    {"LargestScalar", "\xF4\x8F\xBF\xBF", u"\U0010FFFF"},
-    {"LoneContinuation", "a\x80z", u"a\uFFFDz"},
-    {"InvalidLeadFF", "\xFF", u"\uFFFD"},
-    {"OverlongTwoBytes", "\xC0\x80", u"\uFFFD\uFFFD"},
-    {"OverlongThreeBytes", "\xE0\x80\x80", u"\uFFFD\uFFFD\uFFFD"},
-    {"EncodedSurrogate", "\xED\xA0\x80", u"\uFFFD\uFFFD\uFFFD"},
-    {"BeyondUnicode", "\xF4\x90\x80\x80", u"\uFFFD\uFFFD\uFFFD\uFFFD"},
-    {"TruncatedAtEnd", "ab\xE2\x82", u"ab\uFFFD"},
-    {"TruncatedBeforeAscii",
-     "\xE2\x82"
-     "A",
-     u"\uFFFDA"},
-    {"TruncatedBeforeLead", "\xF0\x9F\xC3\xA9", u"\uFFFD\u00E9"},
-};
-
-class Utf8Decode : public ::testing::TestWithParam<DecodeCase> {};
-
-TEST_P(Utf8Decode, ReplacesBrokenSequences) {
-    const auto& c = GetParam();
-    EXPECT_EQ(zrUtf8ToUtf16(c.utf8), c.utf16);
-    ZrWString w;
-    w.Assign(c.utf8.c_str(), ZR_CSET_FILESYSTEM, -1);
-    EXPECT_EQ(w.str(), c.utf16);
-}
-
-INSTANTIATE_TEST_SUITE_P(Host, Utf8Decode, ::testing::ValuesIn(kDecodeCases),
-                         [](const auto& i) { return std::string(i.param.name); });
-
-struct EncodeCase {
-    const char* name;
-    std::u16string utf16;
-    std::string utf8;
-};
-
-const EncodeCase kEncodeCases[] = {
-    {"Ascii", u"abc", "abc"},
-    {"Bmp", u"\u00E9\u20AC", "\xC3\xA9\xE2\x82\xAC"},
-    {"Pair", u"\U0001F600", "\xF0\x9F\x98\x80"},
-    {"LoneHighAtEnd", std::u16string(u"a") + char16_t(0xD83D), "a\xEF\xBF\xBD"},
-    {"LoneLow", std::u16string(1, char16_t(0xDE00)) + u"b",
-     "\xEF\xBF\xBD"
-     "b"},
-    {"HighThenAscii", std::u16string(1, char16_t(0xD83D)) + u"x", "\xEF\xBF\xBDx"},
-    {"LowThenHigh", std::u16string{char16_t(0xDC00), char16_t(0xD800)}, "\xEF\xBF\xBD\xEF\xBF\xBD"},
-};
-
-class Utf16Encode : public ::testing::TestWithParam<EncodeCase> {};
-
-TEST_P(Utf16Encode, ReplacesLoneSurrogates) {
-    const auto& c = GetParam();
-    EXPECT_EQ(zrUtf16ToUtf8(c.utf16), c.utf8);
-    ZrString s;
-    s.Assign(c.utf16.c_str(), ZR_CSET_DEFAULT, static_cast<int>(c.utf16.size()));
-    EXPECT_EQ(s.str(), c.utf8);
-}
-
-INSTANTIATE_TEST_SUITE_P(Host, Utf16Encode, ::testing::ValuesIn(kEncodeCases),
-                         [](const auto& i) { return std::string(i.param.name); });
-
-TEST(HostText, ValidTextRoundTrips) {
+TEST(HostText, ConversionsReplaceBrokenText) {
+    const std::pair<std::string, std::u16string> cases[] = {
+        {"abc", u"abc"},
+        {"", u""},
+        {"\xC3\xA9", u"\u00E9"},
+        {"\xE2\x82\xAC", u"\u20AC"},
+        {"\xF0\x9F\x98\x80", u"\U0001F600"},
+        {"\xF4\x8F\xBF\xBF", u"\U0010FFFF"},
+        {"a\x80z", u"a\uFFFDz"}, // a lone continuation
+        {"\xFF", u"\uFFFD"},
+        {"\xC0\x80", u"\uFFFD\uFFFD"},                     // overlong
+        {"\xE0\x80\x80", u"\uFFFD\uFFFD\uFFFD"},           // overlong
+        {"\xED\xA0\x80", u"\uFFFD\uFFFD\uFFFD"},           // an encoded surrogate
+        {"\xF4\x90\x80\x80", u"\uFFFD\uFFFD\uFFFD\uFFFD"}, // beyond Unicode
+        {"ab\xE2\x82", u"ab\uFFFD"},                       // cut short at the end
+        {"\xE2\x82-", u"\uFFFD-"},                         // ... before ASCII
+        {"\xF0\x9F\xC3\xA9", u"\uFFFD\u00E9"},             // ... before a lead byte
+    };
+    for (const auto& [utf8, utf16] : cases) {
+        EXPECT_EQ(zrUtf8ToUtf16(utf8), utf16) << ::testing::PrintToString(utf8);
+        ZrWString w;
+        w.Assign(utf8.c_str(), ZR_CSET_FILESYSTEM, -1);
+        EXPECT_EQ(w.str(), utf16);
+    }
     const std::string text = "Grüße, 世界 \xF0\x9F\x98\x80 end";
     EXPECT_EQ(zrUtf16ToUtf8(zrUtf8ToUtf16(text)), text);
+
+    // A lone surrogate becomes U+FFFD.
+    const char16_t high = 0xD83D, low = 0xDE00;
+    const std::pair<std::u16string, std::string> encodes[] = {
+        {std::u16string{u'a', high}, "a\xEF\xBF\xBD"},
+        {std::u16string{low, u'-'}, "\xEF\xBF\xBD-"},
+        {std::u16string{high, u'x'}, "\xEF\xBF\xBDx"},
+        {std::u16string{low, high}, "\xEF\xBF\xBD\xEF\xBF\xBD"},
+    };
+    for (const auto& [utf16, utf8] : encodes) {
+        EXPECT_EQ(zrUtf16ToUtf8(utf16), utf8) << ::testing::PrintToString(utf8);
+        ZrString s;
+        s.Assign(utf16.c_str(), ZR_CSET_DEFAULT, static_cast<int>(utf16.size()));
+        EXPECT_EQ(s.str(), utf8);
+    }
 }
 
-TEST(HostText, LengthLimitedCopiesStopAtTerminator) {
+TEST(HostText, LengthLimitedCopiesAndTaggedSearch) {
     ZrWString w;
     EXPECT_EQ(w.Assign("abcdef", ZR_CSET_DEFAULT, 3).str(), u"abc");
     // A length past the terminator must not read beyond it.
@@ -102,9 +69,7 @@ TEST(HostText, LengthLimitedCopiesStopAtTerminator) {
     const ZrWString fromNull(static_cast<const ZrWChar*>(nullptr));
     EXPECT_TRUE(fromNull.empty());
     EXPECT_EQ(fromNull.c_str()[0], u'\0');
-}
 
-TEST(HostText, TaggedStringFindAndSubstr) {
     // The parser-diagnostic use: keep what follows "Message:".
     const ZrXString message(u"Fatal at 3 Message: bad tag", -1);
     const ZrXString marker("Message:", ZR_CSET_DEFAULT);

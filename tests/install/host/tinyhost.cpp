@@ -11,11 +11,10 @@ int main(int argc, char** argv) {
         std::fprintf(stderr, "usage: tinyhost SCHEMA [PLUGIN]\n");
         return 1;
     }
-#ifdef ZRBXMLS_PLUGIN
-    const char* path = argc > 2 ? argv[2] : ZRBXMLS_PLUGIN;
-#else
-    const char* path = argc > 2 ? argv[2] : nullptr;
+#ifndef ZRBXMLS_PLUGIN
+#define ZRBXMLS_PLUGIN nullptr
 #endif
+    const char* path = argc > 2 ? argv[2] : ZRBXMLS_PLUGIN;
     void* plugin = path ? dlopen(path, RTLD_NOW | RTLD_LOCAL) : nullptr;
     if (!plugin) {
         std::fprintf(stderr, "tinyhost: cannot load the plug-in: %s\n", path ? dlerror() : "");
