@@ -1,5 +1,6 @@
-// The component model a schema is read into: one inline schema and the expected
-// model and messages per row, each read whole and one byte at a time.
+// The component model a schema is read into, and the namespaces its names take: one
+// inline schema and the expected model and messages per row, each read whole and one
+// byte at a time.
 #include "model_dump.h"
 
 #include <gtest/gtest.h>
@@ -12,7 +13,7 @@ constexpr const char* kTns = R"(targetNamespace="urn:t" xmlns:t="urn:t")";
 
 struct ModelCase {
     const char* name;
-    const char* schemaAttrs;
+    const char* schemaAttrs; // null: `body` is the whole document
     const char* body;
     const char* model;
     const char* messages;
@@ -182,36 +183,22 @@ const ModelCase kModelCases[] = {
      "512 0 xmlns in complextype attrs\n"
      "512 0 xmlns in extension attrs\n"
      "512 0 xmlns in complextype attrs\n"},
-    {"FacetsLastOneWinsEnumerationKeepsLongest", kTns,
-     R"(<xs:simpleType name="Code"><xs:restriction base="xs:string">
-          <xs:length value="3"/><xs:maxLength value="10"/>
-          <xs:pattern value="[A-Z]+"/><xs:pattern value="[a-z]+"/>
-          <xs:enumeration value="a"/><xs:enumeration value="abc"/><xs:enumeration value="ab"/>
-          <xs:enumeration/><xs:totalDigits value="5"/><xs:whiteSpace value="collapse"/>
-        </xs:restriction></xs:simpleType>)",
-     "simpleType {urn:t}Code base={xs}string length=3 maxLength=10 pattern=[a-z]+ enum=3\n", ""},
-    {"EveryTextFacetAndAValuelessOne", "",
+    // The last value of a facet wins, a valueless one clears it; an enumeration keeps
+    // the longest value.
+    {"EveryTextFacetLastOneWinsEnumerationKeepsLongest", "",
      R"(<xs:simpleType name="All"><xs:restriction base="xs:decimal">
           <xs:minInclusive value="1"/><xs:maxInclusive value="2"/>
           <xs:minExclusive value="3"/><xs:maxExclusive value="4"/>
           <xs:length value="5" fixed="true"/><xs:minLength id="x" value="6"/>
-          <xs:maxLength value="7"/><xs:maxLength fixed="true"/><xs:pattern value="8"/>
-          <xs:precision value="9"/><xs:scale value="10"/><xs:encoding value="hex"/>
-          <xs:period value="P1D"/><xs:duration value="PT1H"/>
+          <xs:maxLength value="7"/><xs:maxLength fixed="true"/><xs:pattern value="[A-Z]+"/>
+          <xs:pattern value="8"/><xs:precision value="9"/><xs:scale value="10"/>
+          <xs:encoding value="hex"/><xs:period value="P1D"/><xs:duration value="PT1H"/>
+          <xs:enumeration value="a"/><xs:enumeration value="abc"/><xs:enumeration value="ab"/>
+          <xs:enumeration/><xs:totalDigits value="5"/><xs:whiteSpace value="collapse"/>
         </xs:restriction></xs:simpleType>)",
      "simpleType All base={xs}decimal minInclusive=1 maxInclusive=2 minExclusive=3 "
      "maxExclusive=4 length=5 minLength=6 pattern=8 precision=9 scale=10 encoding=hex "
-     "period=P1D duration=PT1H\n",
-     ""},
-    {"InlineSimpleTypeBecomesTheAttributeType", kTns,
-     R"(<xs:element name="e"><xs:complexType>
-          <xs:attribute name="a"><xs:simpleType><xs:restriction base="xs:string">
-            <xs:maxLength value="5"/></xs:restriction></xs:simpleType></xs:attribute>
-        </xs:complexType></xs:element>)",
-     "global element name={urn:t}e type=anon0\n"
-     "complexType anon0\n"
-     "  attribute name={urn:t}a type=anon1\n"
-     "simpleType anon1 base={xs}string maxLength=5\n",
+     "period=P1D duration=PT1H enum=3\n",
      ""},
     {"ListsAreStringsAndTheirItemTypesTypesOfTheirOwn", kTns,
      R"(<xs:simpleType name="L"><xs:list itemType="xs:int"/></xs:simpleType>
@@ -241,9 +228,11 @@ const ModelCase kModelCases[] = {
      R"(<xs:simpleType name="S"><xs:restriction base="xs:string"><xs:maxLength value="4"/>
         </xs:restriction></xs:simpleType>
         <xs:complexType name="C"><xs:simpleContent><xs:restriction base="Base">
-          <xs:maxLength value="8"/></xs:restriction></xs:simpleContent></xs:complexType>)",
+          <xs:maxLength value="8"/></xs:restriction></xs:simpleContent></xs:complexType>
+        <xs:simpleType name="T"><xs:restriction base="xs:string"/></xs:simpleType>)",
      "complexType C base=Base maxLength=8 simpleContent\n"
-     "simpleType S base={xs}string maxLength=4\n",
+     "simpleType S base={xs}string maxLength=4\n"
+     "simpleType T base={xs}string\n",
      ""},
     {"RestrictionAndListBeforeAnyTypeGoNowhere", "",
      R"(<xs:restriction base="xs:string"><xs:maxLength value="3"/></xs:restriction>
@@ -258,13 +247,54 @@ const ModelCase kModelCases[] = {
      "complexType {urn:t}T\n"
      "  attribute name={urn:t}second type={xs}string\n",
      ""},
+    // The XML Schema namespace as the default namespace reads like the prefixed form.
+    {"DefaultNamespaceSchemaReadsLikeAPrefixedOne", nullptr,
+     R"(<schema xmlns="http://www.w3.org/2001/XMLSchema" targetNamespace="urn:t">
+           <element name="e"><complexType><sequence><element name="a" type="string"/></sequence>
+             <attribute name="b"><simpleType><restriction base="int">
+               <maxInclusive value="5"/></restriction></simpleType></attribute>
+           </complexType></element></schema>)",
+     "global element name={urn:t}e type=anon0\n"
+     "complexType anon0\n"
+     "  element name={urn:t}a type={xs}string\n"
+     "  attribute name={urn:t}b type=anon1\n"
+     "simpleType anon1 base={xs}int maxInclusive=5\n",
+     ""},
+    // The first element's attributes declare the namespaces: "xmlns" followed by
+    // anything but a colon is the default one, "xmlns:" an empty prefix.
+    {"FirstElementAttributesDeclareTheNamespaces", nullptr,
+     R"(<x:schema xmlns:x="http://www.w3.org/2001/XMLSchema" xmlnsFoo="urn:d" xmlns:="urn:e"
+          targetNamespace="urn:t" version="1" elementFormDefault="qualified"
+          attributeFormDefault="unqualified" id="s">
+          <x:element name="e" type=":T"/><x:element name="f" type="T"/></x:schema>)",
+     "global element name={urn:t}e type={urn:e}T\n"
+     "global element name={urn:t}f type={urn:d}T\n",
+     "512 0 Unknown first element attribute 'id'\n"},
+    // Only the first element of a document declares the target namespace, whatever
+    // its name; prefixes declared below it hold within their element.
+    {"OnlyTheFirstElementDeclaresTheTarget", nullptr,
+     R"(<wrapper xmlns:xs="http://www.w3.org/2001/XMLSchema" targetNamespace="urn:w" bogus="1">
+          <xs:schema targetNamespace="urn:ignored" xmlns:q="urn:q">
+            <xs:element name="a" type="q:T"/></xs:schema></wrapper>)",
+     "global element name={urn:w}a type={urn:q}T\n",
+     "512 0 Unknown first element attribute 'bogus'\n"},
+    // Before any "schema" element no schema namespace is known: every element is
+    // reported.
+    {"ElementsBeforeAnySchemaElementAreReported", nullptr,
+     R"(<xs:element xmlns:xs="http://www.w3.org/2001/XMLSchema" name="a" type="xs:string"/>)",
+     "global element name=a type={xs}string\n",
+     "512 0 Unknown first element attribute 'name'\n"
+     "512 0 Unknown first element attribute 'type'\n"
+     "512 0 Element 'element' not in XMLSchema namespace (is "
+     "'http://www.w3.org/2001/XMLSchema', should be ''\n"
+     "512 0 xmlns in element attrs\n"},
 };
 
 class ModelReading : public ::testing::TestWithParam<ModelCase> {};
 
 TEST_P(ModelReading, ReadsTheSameModelWholeAndByteByByte) {
     const ModelCase& c = GetParam();
-    const std::string document = schemaDoc(c.body, c.schemaAttrs);
+    const std::string document = c.schemaAttrs ? schemaDoc(c.body, c.schemaAttrs) : c.body;
     for (XMLSize_t chunk : {XMLSize_t(0), XMLSize_t(1)}) {
         SCOPED_TRACE("chunk " + std::to_string(chunk));
         const ReadOutcome read = readSchemaText(document, chunk);
@@ -276,56 +306,6 @@ TEST_P(ModelReading, ReadsTheSameModelWholeAndByteByByte) {
 
 INSTANTIATE_TEST_SUITE_P(Schemas, ModelReading, ::testing::ValuesIn(kModelCases),
                          [](const auto& row) { return std::string(row.param.name); });
-
-// The XML Schema namespace as the default namespace reads like the prefixed form
-// every other case uses.
-TEST(ModelReading, DefaultNamespaceSchemaReadsLikeAPrefixedOne) {
-    const ReadOutcome read =
-        readSchemaText(std::string("<?xml version=\"1.0\"?>\n<schema xmlns=\"") + kXsdNs +
-                       R"(" xmlns:xs=")" + kXsdNs + R"(" targetNamespace="urn:t">
-           <element name="e"><complexType><sequence>
-             <element name="a" type="string"/></sequence>
-             <attribute name="b"><simpleType><restriction base="int">
-               <maxInclusive value="5"/></restriction></simpleType></attribute>
-           </complexType></element></schema>)");
-    EXPECT_TRUE(read.ok);
-    EXPECT_EQ(read.log, "");
-    EXPECT_EQ(read.model, "global element name={urn:t}e type=anon0\n"
-                          "complexType anon0\n"
-                          "  element name={urn:t}a type={xs}string\n"
-                          "  attribute name={urn:t}b type=anon1\n"
-                          "simpleType anon1 base={xs}int maxInclusive=5\n");
-}
-
-// Facets inside a complex type's simple-content restriction go to that type and
-// leave the next simple type alone.
-TEST(ModelReading, SimpleContentFacetsLandInTheComplexType) {
-    const ReadOutcome read = readSchemaText(
-        schemaDoc(R"(<xs:complexType name="C"><xs:simpleContent><xs:restriction base="B">
-                       <xs:maxLength value="8"/></xs:restriction></xs:simpleContent>
-                     </xs:complexType>
-                     <xs:simpleType name="S"><xs:restriction base="xs:string"/></xs:simpleType>)"));
-    EXPECT_TRUE(read.ok);
-    EXPECT_EQ(read.model, "complexType C base=B maxLength=8 simpleContent\n"
-                          "simpleType S base={xs}string\n");
-}
-
-// A second read with the same browser starts from an empty model and numbers
-// generated names from zero again.
-TEST(ModelReading, RereadingGivesTheSameModel) {
-    TempDir dir;
-    const std::string path =
-        dir.write("main.xsd", schemaDoc(R"(<xs:element name="e"><xs:complexType>
-            <xs:attribute name="a"><xs:simpleType><xs:restriction base="xs:string"/>
-            </xs:simpleType></xs:attribute></xs:complexType></xs:element>)"));
-    SchemaModel model;
-    SchemaReader reader(model);
-    ASSERT_TRUE(reader.read(wide(path).c_str()));
-    const std::string first = dumpModel(model);
-    ASSERT_TRUE(reader.read(wide(path).c_str()));
-    EXPECT_EQ(dumpModel(model), first);
-    EXPECT_EQ(model.anonCount, 2);
-}
 
 // Null names are accepted: a generated-looking name is found whatever the
 // namespace, no name finds nothing (the index is checked in model_index_lookup.cpp).
@@ -339,10 +319,12 @@ TEST(ModelLookup, NullNamesAndNamespaces) {
     EXPECT_EQ(model.findComplexType({}, {}), nullptr);
 }
 
+// The reader clears the working declaration and type after moving them away; what
+// a move leaves behind must go, but a declaration's nullable flag stays.
 TEST(ModelRecords, ClearKeepsWhatTheReaderReliesOn) {
     ElementDef e;
-    e.name = wide("n").view();
-    e.refName = wide("r").view();
+    e.name = u"n";
+    e.refName = u"r";
     e.isAttribute = true;
     e.nullable = false;
     e.clear();
@@ -353,8 +335,7 @@ TEST(ModelRecords, ClearKeepsWhatTheReaderReliesOn) {
     t.maxLength = u"3";
     t.maxEnumLength = 4;
     t.content.push_back(e);
-    t.isGroup = true;
-    t.simpleContent = true;
+    t.isGroup = t.simpleContent = true;
     t.clear();
     EXPECT_EQ(dumpTypeParts(t), "");
     EXPECT_TRUE(t.content.empty());

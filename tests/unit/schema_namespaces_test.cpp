@@ -1,4 +1,5 @@
-// Namespace state, name resolution and the first element's attributes.
+// Names resolved through the namespace state, and namespaces written back as prefixes
+// (documents that declare namespaces are read in model_reading_test.cpp).
 #include "model_dump.h"
 
 #include <gtest/gtest.h>
@@ -77,49 +78,6 @@ TEST(Namespaces, Reverse) {
     const PrefixWriter sameUri(model.namespaces);
     EXPECT_EQ(utf8(sameUri.prefixOf(u"urn:t", false)), "");
     EXPECT_EQ(utf8(sameUri.prefixOf(u"urn:t", true)), "zrxxxtrg");
-}
-
-TEST(Namespaces, FirstElementAttributesDeclareTheNamespaces) {
-    TempDir dir;
-    LogCapture log;
-    const std::string valid = dir.write(
-        "valid.xsd", std::string("<x:schema xmlns:x=\"") + kXsdNs +
-                         R"(" xmlnsFoo="urn:d" xmlns:="urn:e" targetNamespace="urn:t" version="1"
-                 elementFormDefault="qualified" attributeFormDefault="unqualified" id="s">
-               <x:element name="e" type=":T"/><x:element name="f" type="T"/></x:schema>)");
-    const ReadOutcome read = readSchemaFile(valid, dir.path().string());
-    EXPECT_TRUE(read.ok);
-    EXPECT_EQ(read.log, "512 0 Unknown first element attribute 'id'\n");
-    EXPECT_EQ(read.model, "global element name={urn:t}e type={urn:e}T\n"
-                          "global element name={urn:t}f type={urn:d}T\n");
-}
-
-// Only the first element of a document declares the target namespace, whatever its
-// name; prefixes declared below it hold within their element.
-TEST(Namespaces, OnlyTheFirstElementDeclaresTheTarget) {
-    const std::string document = std::string("<wrapper xmlns:xs=\"") + kXsdNs +
-                                 R"(" targetNamespace="urn:w" bogus="1">
-          <xs:schema targetNamespace="urn:ignored" xmlns:q="urn:q">
-            <xs:element name="a" type="q:T"/></xs:schema></wrapper>)";
-    const ReadOutcome read = readSchemaText(document);
-    EXPECT_TRUE(read.ok);
-    EXPECT_EQ(read.model, "global element name={urn:w}a type={urn:q}T\n");
-    EXPECT_EQ(read.log, "512 0 Unknown first element attribute 'bogus'\n");
-}
-
-// Before any "schema" element the browser knows no schema namespace, so every
-// element is reported.
-TEST(Namespaces, ElementsBeforeAnySchemaElementAreReported) {
-    const std::string document =
-        std::string("<xs:element xmlns:xs=\"") + kXsdNs + R"(" name="a" type="xs:string"/>)";
-    const ReadOutcome read = readSchemaText(document);
-    EXPECT_TRUE(read.ok);
-    EXPECT_EQ(read.model, "global element name=a type={xs}string\n");
-    EXPECT_EQ(read.log, "512 0 Unknown first element attribute 'name'\n"
-                        "512 0 Unknown first element attribute 'type'\n"
-                        "512 0 Element 'element' not in XMLSchema namespace (is "
-                        "'http://www.w3.org/2001/XMLSchema', should be ''\n"
-                        "512 0 xmlns in element attrs\n");
 }
 
 } // namespace
