@@ -42,14 +42,10 @@ const ModelCase kModelCases[] = {
      ""},
     {"NullableIsFalseOnlyForFalseInAnyCase", "",
      R"(<xs:element name="a" type="xs:string" nullable="False"/>
-        <xs:element name="b" type="xs:string" nullable="FALSE"/>
         <xs:element name="c" type="xs:string" nullable="no"/>
-        <xs:element name="d" type="xs:string" nullable="0"/>
         <xs:element name="e" type="xs:string" nullable=""/>)",
      "global element name=a type={xs}string !nullable\n"
-     "global element name=b type={xs}string !nullable\n"
      "global element name=c type={xs}string\n"
-     "global element name=d type={xs}string\n"
      "global element name=e type={xs}string\n",
      ""},
     {"DeclarationNamespacesHoldForTheirElement", "",

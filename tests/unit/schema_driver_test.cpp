@@ -162,22 +162,14 @@ TEST_P(Driver, ReadsOrFailsWithTheExpectedMessages) {
 INSTANTIATE_TEST_SUITE_P(Documents, Driver, ::testing::ValuesIn(kDriverCases),
                          [](const auto& row) { return std::string(row.param.name); });
 
-// Runs a test body in another working directory.
-class WorkingDirectory {
-  public:
-    explicit WorkingDirectory(const std::filesystem::path& dir)
-        : saved_(std::filesystem::current_path()) {
-        std::filesystem::current_path(dir);
-    }
-
-    WorkingDirectory(const WorkingDirectory&) = delete;
-    WorkingDirectory& operator=(const WorkingDirectory&) = delete;
-
-    ~WorkingDirectory() { std::filesystem::current_path(saved_); }
-
-  private:
-    std::filesystem::path saved_;
-};
+// The model read from `path` with `cwd` as the working directory.
+std::string readFrom(const std::filesystem::path& cwd, const std::string& path) {
+    const std::filesystem::path saved = std::filesystem::current_path();
+    std::filesystem::current_path(cwd);
+    const std::string model = readSchemaFile(path, "").model;
+    std::filesystem::current_path(saved);
+    return model;
+}
 
 // The main document given by a relative path, with and without a directory part,
 // and an include location given by an absolute path.
@@ -191,15 +183,10 @@ TEST(Driver, RelativeAndAbsoluteMainPaths) {
     dir.write("sub/types.xsd", doc("decoy"));
     const std::string expected = globals({"main", "types", "abs", "more"});
 
-    const std::string root = dir.path().string();
-    EXPECT_EQ(readSchemaFile(root + "/schemas/main.xsd", root).model, expected);
-    {
-        WorkingDirectory cwd(dir.path());
-        EXPECT_EQ(readSchemaFile("schemas/main.xsd", root).model, expected);
-        EXPECT_EQ(readSchemaFile("./schemas//main.xsd", root).model, expected);
-    }
-    WorkingDirectory cwd(dir.path() / "schemas");
-    EXPECT_EQ(readSchemaFile("main.xsd", root).model, expected);
+    EXPECT_EQ(readFrom("/", (dir.path() / "schemas/main.xsd").string()), expected);
+    EXPECT_EQ(readFrom(dir.path(), "schemas/main.xsd"), expected);
+    EXPECT_EQ(readFrom(dir.path(), "./schemas//main.xsd"), expected);
+    EXPECT_EQ(readFrom(dir.path() / "schemas", "main.xsd"), expected);
 }
 
 // An error while reading bytes is logged and fails the read; it never reaches
@@ -214,31 +201,24 @@ TEST(Driver, UnreadableFileFailsTheRead) {
         << read.log;
 }
 
-TEST(Driver, DiagnosticsNameThePlaceAndKeepTheTextAfterMessage) {
-    struct Row {
-        void (SchemaReader::*callback)(const xercesc::SAXParseException&);
-        const char16_t* message;
-        bool fails;
-        const char* logged;
-    };
+// The logged text of one parser diagnostic given to a fresh reader, and whether the
+// read fails.
+template <class Callback> std::string diagnose(Callback callback, const char16_t* message) {
+    SchemaModel model;
+    SchemaReader reader(model);
+    LogCapture log;
+    (reader.*callback)(xercesc::SAXParseException(message, u"", u"/s.xsd", 3, 5));
+    return log.lines() + (reader.hasFailed() ? "failed\n" : "");
+}
 
-    const Row rows[] = {
-        {&SchemaReader::warning, u"plain text", false,
-         "2 4 Schema: Warning: At line 3, column 5 of file /s.xsd: plain text\n"},
-        {&SchemaReader::error, u"Type:X, Message: the cause", true,
-         "4 4 Schema: Error: At line 3, column 5 of file /s.xsd:  the cause\n"},
-        {&SchemaReader::fatalError, u"Message:first Message:second", true,
-         "8 4 Schema: Fatal: At line 3, column 5 of file /s.xsd: first Message:second\n"},
-    };
-    for (const Row& row : rows) {
-        SchemaModel model;
-        SchemaReader reader(model);
-        LogCapture log;
-        const xercesc::SAXParseException e(row.message, u"", u"/s.xsd", 3, 5);
-        (reader.*row.callback)(e);
-        EXPECT_EQ(log.lines(), row.logged);
-        EXPECT_EQ(reader.hasFailed(), row.fails);
-    }
+TEST(Driver, DiagnosticsNameThePlaceAndKeepTheTextAfterMessage) {
+    EXPECT_EQ(diagnose(&SchemaReader::warning, u"plain text"),
+              "2 4 Schema: Warning: At line 3, column 5 of file /s.xsd: plain text\n");
+    EXPECT_EQ(diagnose(&SchemaReader::error, u"Type:X, Message: the cause"),
+              "4 4 Schema: Error: At line 3, column 5 of file /s.xsd:  the cause\nfailed\n");
+    EXPECT_EQ(diagnose(&SchemaReader::fatalError, u"Message:first Message:second"),
+              "8 4 Schema: Fatal: At line 3, column 5 of file /s.xsd: first Message:second\n"
+              "failed\n");
 }
 
 // A read that failed half-way leaves documents queued and a non-nullable
