@@ -35,11 +35,6 @@ const ModelCase kModelCases[] = {
      "  element name={urn:t}item type=anon1\n"
      "  attribute name={urn:t}status type={xs}string\n",
      ""},
-    {"TypeAttributeWinsOverInlineType", "",
-     R"(<xs:element name="e" type="xs:string"><xs:complexType/></xs:element>)",
-     "global element name=e type={xs}string\n"
-     "complexType anon0\n",
-     ""},
     {"NullableIsFalseOnlyForFalseInAnyCase", "",
      R"(<xs:element name="a" type="xs:string" nullable="False"/>
         <xs:element name="c" type="xs:string" nullable="no"/>
@@ -64,12 +59,17 @@ const ModelCase kModelCases[] = {
      "global element name={urn:t}c type={xs}a:b\n"
      "global element name={urn:t}d type={urn:t}T\n",
      ""},
-    {"ElementInsideElementIsStoredFirst", "",
-     R"(<xs:element name="p" type="xs:string"><xs:element name="c" type="xs:int"/></xs:element>
+    // A type attribute wins over a type defined inside the declaration; a declaration
+    // inside another is stored first.
+    {"TypeAttributeWinsAndInnerDeclarationsComeFirst", "",
+     R"(<xs:element name="e" type="xs:string"><xs:complexType/></xs:element>
+        <xs:element name="p" type="xs:string"><xs:element name="c" type="xs:int"/></xs:element>
         <xs:attribute name="lang" type="xs:language"/>)",
+     "global element name=e type={xs}string\n"
      "global element name=c type={xs}int\n"
      "global element name=p type={xs}string\n"
-     "global attribute name=lang type={xs}language\n",
+     "global attribute name=lang type={xs}language\n"
+     "complexType anon0\n",
      ""},
     {"ForeignAndUnboundTagsAreReportedAndHandled", R"(xmlns:f="urn:foreign")",
      R"(<f:element name="x" type="xs:string"/>
@@ -98,32 +98,33 @@ const ModelCase kModelCases[] = {
      "  element name={urn:t}a type={xs}string\n"
      "  element name={urn:t}b type={xs}int\n",
      ""},
-    {"BasesFromComplexTypeExtensionAndContent", kTns,
+    // A restriction after an inline simple type belongs to the complex type again.
+    {"BasesFromComplexTypeExtensionRestrictionAndContent", kTns,
      R"(<xs:complexType name="D" base="t:B" derivedBy="extension"/>
         <xs:complexType name="Price"><xs:simpleContent><xs:extension base="xs:decimal">
           <xs:attribute name="currency" type="xs:string"/></xs:extension></xs:simpleContent>
         </xs:complexType>
         <xs:complexType name="X"><xs:simpleContent/><xs:complexContent>
-          <xs:extension base="t:Y"/></xs:complexContent></xs:complexType>)",
-     "complexType {urn:t}D base={urn:t}B\n"
-     "complexType {urn:t}Price base={xs}decimal simpleContent\n"
-     "  attribute name={urn:t}currency type={xs}string\n"
-     "complexType {urn:t}X base={urn:t}Y\n",
-     ""},
-    {"RestrictionAfterInlineSimpleTypeTargetsTheComplexType", kTns,
-     R"(<xs:complexType name="C">
+          <xs:extension base="t:Y"/></xs:complexContent></xs:complexType>
+        <xs:complexType name="C">
           <xs:attribute name="a"><xs:simpleType><xs:restriction base="xs:string">
             <xs:maxLength value="5"/></xs:restriction></xs:simpleType></xs:attribute>
           <xs:complexContent><xs:restriction base="t:Base"/></xs:complexContent>
         </xs:complexType>)",
+     "complexType {urn:t}D base={urn:t}B\n"
+     "complexType {urn:t}Price base={xs}decimal simpleContent\n"
+     "  attribute name={urn:t}currency type={xs}string\n"
+     "complexType {urn:t}X base={urn:t}Y\n"
      "complexType {urn:t}C base={urn:t}Base\n"
      "  attribute name={urn:t}a type=anon0\n"
      "simpleType anon0 base={xs}string maxLength=5\n",
      ""},
+    // A group reference inside a group definition keeps the definition open.
     {"GroupsAndAttributeGroups", "",
-     R"(<xs:group name="g"><xs:sequence><xs:element name="a" type="xs:string"/></xs:sequence>
-        </xs:group>
-        <xs:attributeGroup name="ag"><xs:attribute name="x" type="xs:string"/></xs:attributeGroup>
+     R"(<xs:group name="g"><xs:sequence><xs:element name="a" type="xs:string"/>
+          <xs:group ref="inner"/><xs:element name="b" type="xs:string"/></xs:sequence></xs:group>
+        <xs:attributeGroup name="ag"><xs:attributeGroup ref="more"/>
+          <xs:attribute name="x" type="xs:string"/></xs:attributeGroup>
         <xs:complexType name="T"><xs:sequence><xs:element name="first" type="xs:string"/>
           <xs:group ref="g"/></xs:sequence><xs:attribute name="before" type="xs:string"/>
           <xs:attributeGroup ref="ag"/><xs:attribute name="after" type="xs:string"/>
@@ -132,7 +133,10 @@ const ModelCase kModelCases[] = {
      "global element group=g\n"
      "complexType g group\n"
      "  element name=a type={xs}string\n"
+     "  element group=inner\n"
+     "  element name=b type={xs}string\n"
      "complexType ag group\n"
+     "  element group=more\n"
      "  attribute name=x type={xs}string\n"
      "complexType T\n"
      "  element name=first type={xs}string\n"
@@ -140,21 +144,6 @@ const ModelCase kModelCases[] = {
      "  attribute name=before type={xs}string\n"
      "  element group=ag\n"
      "  attribute name=after type={xs}string\n",
-     ""},
-    {"GroupReferenceInsideGroupKeepsTheDefinitionOpen", "",
-     R"(<xs:group name="outer"><xs:sequence><xs:element name="a" type="xs:string"/>
-          <xs:group ref="inner"/><xs:element name="b" type="xs:string"/></xs:sequence></xs:group>
-        <xs:attributeGroup name="attrs"><xs:attributeGroup ref="more"/>
-          <xs:attribute name="c" type="xs:string"/></xs:attributeGroup>
-        <xs:element name="after" type="xs:string"/>)",
-     "global element name=after type={xs}string\n"
-     "complexType outer group\n"
-     "  element name=a type={xs}string\n"
-     "  element group=inner\n"
-     "  element name=b type={xs}string\n"
-     "complexType attrs group\n"
-     "  element group=more\n"
-     "  attribute name=c type={xs}string\n",
      ""},
     {"GroupNameAndRefAndAnonymousGroup", "",
      R"(<xs:group name="g" ref="h"><xs:element name="a" type="xs:string"/></xs:group>

@@ -3,6 +3,7 @@
 #include "model_dump.h"
 
 #include <gtest/gtest.h>
+#include <tuple>
 
 namespace {
 
@@ -20,15 +21,10 @@ void setUpNamespaces(NamespaceBindings& bindings) {
     bindings.prefixes[u""] = u"urn:empty";
 }
 
-struct ParseCase {
-    const char* name;
-    bool useDefault;
-    const char* local;
-    const char* ns;
-};
-
 TEST(Namespaces, ParseNameSplitsAtTheFirstColonAndResolvesThePrefix) {
-    const ParseCase cases[] = {
+    // The name, whether a bare name takes the default namespace (else the target one),
+    // the local part and namespace it resolves to.
+    const std::tuple<const char*, bool, const char*, const char*> cases[] = {
         {"plain", true, "plain", "urn:d"},  {"plain", false, "plain", "urn:t"},
         {"a:x", false, "x", "urn:shared"},  {"a:b:c", true, "b:c", "urn:shared"},
         {"zrxxxtrg:x", true, "x", "urn:t"}, {"unbound:x", true, "x", ""},
@@ -38,13 +34,12 @@ TEST(Namespaces, ParseNameSplitsAtTheFirstColonAndResolvesThePrefix) {
     SchemaModel model;
     SchemaReader reader(model);
     setUpNamespaces(model.namespaces);
-    for (const ParseCase& c : cases) {
-        SCOPED_TRACE(std::string(c.name) + (c.useDefault ? " default" : " target"));
+    for (const auto& [name, useDefault, wantLocal, wantNs] : cases) {
         ZrName local(u"old");
         ZrName ns(u"old");
-        reader.parseName(wide(c.name).c_str(), c.useDefault, local, ns);
-        EXPECT_EQ(utf8(local), c.local);
-        EXPECT_EQ(utf8(ns), c.ns);
+        reader.parseName(wide(name).c_str(), useDefault, local, ns);
+        EXPECT_EQ(utf8(local) + " " + utf8(ns), std::string(wantLocal) + " " + wantNs)
+            << name << (useDefault ? " default" : " target");
     }
     // The text may live in an output.
     ZrName local(u"a:in");
@@ -56,23 +51,15 @@ TEST(Namespaces, ParseNameSplitsAtTheFirstColonAndResolvesThePrefix) {
 TEST(Namespaces, Reverse) {
     SchemaModel model;
     setUpNamespaces(model.namespaces);
-
-    struct ReverseCase {
-        const char* uri;
-        bool useTargetPrefix;
-        const char* prefix;
-    };
-
-    const ReverseCase cases[] = {
+    // The URI, whether the target namespace takes its own prefix, the prefix written.
+    const std::tuple<const char*, bool, const char*> cases[] = {
         {"urn:t", true, "zrxxxtrg"}, {"urn:t", false, ""},           {"urn:d", true, ""},
         {"urn:shared", true, "a"},   {"urn:own", false, "zrxxxtrg"}, {"urn:none", true, ""},
         {"urn:empty", false, ""},
     };
     const PrefixWriter writer(model.namespaces);
-    for (const ReverseCase& c : cases) {
-        SCOPED_TRACE(c.uri);
-        EXPECT_EQ(utf8(writer.prefixOf(zrUtf8ToUtf16(c.uri), c.useTargetPrefix)), c.prefix);
-    }
+    for (const auto& [uri, useTargetPrefix, prefix] : cases)
+        EXPECT_EQ(utf8(writer.prefixOf(zrUtf8ToUtf16(uri), useTargetPrefix)), prefix) << uri;
     // Default and target namespace the same URI.
     model.namespaces.defaultNamespace = u"urn:t";
     const PrefixWriter sameUri(model.namespaces);
