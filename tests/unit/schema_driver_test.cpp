@@ -1,7 +1,6 @@
 // The parse driver: which documents a read takes in, in which order, where included
 // documents are looked for, failed reads and the parser's diagnostics (hostile
 // documents have tests of their own).
-#include "ParserConfig.h"
 #include "model_dump.h"
 
 #include <filesystem>
