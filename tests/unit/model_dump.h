@@ -21,10 +21,8 @@ inline std::string qname(const ZrName& local, const ZrName& ns) {
     const std::string text = utf8(std::u16string_view(local.c_str()));
     if (ns.empty())
         return text;
-    std::string uri = utf8(ns);
-    if (uri == kXsdNs)
-        uri = "xs";
-    return "{" + uri + "}" + text;
+    const std::string uri = utf8(ns);
+    return "{" + (uri == kXsdNs ? "xs" : uri) + "}" + text;
 }
 
 inline std::string dumpElement(const ElementDef& e) {
@@ -37,11 +35,10 @@ inline std::string dumpElement(const ElementDef& e) {
     part("type", e.typeName, e.typeNs);
     part("ref", e.refName, e.refNs);
     part("group", e.groupName, e.groupNs);
-    if (!e.nullable)
-        out += " !nullable";
-    return out;
+    return out + (e.nullable ? "" : " !nullable");
 }
 
+// The name, base, facets as written, longest enumeration and union members.
 inline std::string dumpTypeParts(const SimpleTypeDef& t) {
     std::string out = qname(t.name, t.nameNs);
     if (!t.baseName.empty() || !t.baseNs.empty())
@@ -65,27 +62,20 @@ inline std::string dumpTypeParts(const SimpleTypeDef& t) {
     }
     if (t.maxEnumLength != 0)
         out += " enum=" + std::to_string(t.maxEnumLength);
-    if (t.isUnion) {
-        out += " union=";
-        for (size_t i = 0; i < t.memberTypes.size(); ++i)
-            out += (i ? "," : "") + qname(t.memberTypes[i].name, t.memberTypes[i].ns);
-    }
+    for (size_t i = 0; t.isUnion && i < t.memberTypes.size(); ++i)
+        out += (i ? "," : " union=") + qname(t.memberTypes[i].name, t.memberTypes[i].ns);
     return out;
 }
 
-// Top-level declarations, then complex types with their content, then simple
-// types, each in stored order.
+// One line per component: top-level declarations, complex types (their content
+// indented below them), simple types, each in stored order.
 inline std::string dumpModel(const SchemaModel& model) {
     std::string out;
     for (const ElementDef& e : model.globalElements)
         out += "global " + dumpElement(e) + "\n";
     for (const ComplexTypeDef& t : model.complexTypes) {
-        out += "complexType " + dumpTypeParts(t);
-        if (t.isGroup)
-            out += " group";
-        if (t.simpleContent)
-            out += " simpleContent";
-        out += "\n";
+        out += "complexType " + dumpTypeParts(t) + (t.isGroup ? " group" : "") +
+               (t.simpleContent ? " simpleContent" : "") + "\n";
         for (const ElementDef& e : t.content)
             out += "  " + dumpElement(e) + "\n";
     }
@@ -102,22 +92,28 @@ inline std::string replaceAll(std::string text, const std::string& from, const s
     return text;
 }
 
-// Runs a read with the input handed out at most `chunk` bytes at a time (0: as
-// much as the parser asks for).
-class ChunkLimit {
-  public:
-    explicit ChunkLimit(XMLSize_t chunk) : saved_(FPInputStream::chunkLimit) {
-        FPInputStream::chunkLimit = chunk;
+// True when `text` matches `pattern`, in which '*' stands for any run of
+// characters, line ends included; the parser's own texts are matched that way.
+inline bool globMatch(const std::string& pattern, const std::string& text) {
+    size_t p = 0, t = 0, star = std::string::npos, mark = 0;
+    while (t < text.size()) {
+        if (p < pattern.size() && pattern[p] == '*') {
+            star = p++;
+            mark = t;
+        } else if (p < pattern.size() && pattern[p] == text[t]) {
+            ++p;
+            ++t;
+        } else if (star != std::string::npos) {
+            p = star + 1;
+            t = ++mark;
+        } else {
+            return false;
+        }
     }
-
-    ChunkLimit(const ChunkLimit&) = delete;
-    ChunkLimit& operator=(const ChunkLimit&) = delete;
-
-    ~ChunkLimit() { FPInputStream::chunkLimit = saved_; }
-
-  private:
-    XMLSize_t saved_;
-};
+    while (p < pattern.size() && pattern[p] == '*')
+        ++p;
+    return p == pattern.size();
+}
 
 struct ReadOutcome {
     bool ok;
@@ -125,14 +121,16 @@ struct ReadOutcome {
     std::string log;   // LogCapture lines, the temporary folder shown as "$DIR"
 };
 
-// Reads `mainPath` into a fresh model.
+// Reads `mainPath` into a fresh model, the input handed out at most `chunk` bytes
+// at a time (0: as much as the parser asks for).
 inline ReadOutcome readSchemaFile(const std::string& mainPath, const std::string& dir,
                                   XMLSize_t chunk = 0) {
-    ChunkLimit limit(chunk);
+    const XMLSize_t saved = FPInputStream::chunkLimit.exchange(chunk);
     LogCapture log;
     SchemaModel model;
     SchemaReader reader(model);
     const bool ok = reader.read(wide(mainPath).c_str());
+    FPInputStream::chunkLimit.store(saved);
     return {ok, dumpModel(model), replaceAll(log.lines(), dir, "$DIR")};
 }
 
