@@ -178,6 +178,7 @@ string             0            999         -           -    -
 string@            0            999         -           -    -
 decimal            0            999         -           -    -
 date               0            999         -           -    -
+gYear              0            9999        -           -    -
 hexBinary          0            999         -           -    -
 )";
 

@@ -47,6 +47,13 @@ const ModelCase kModelCases[] = {
      R"(<xs:element name="a" type="foo:bar" xmlns:foo="urn:foo" minOccurs="0" maxOccurs="2"
             default="x" fixed="y" form="qualified" use="required"/>)",
      "global element name=a type={urn:foo}bar\n", "512 0 xmlns in element attrs\n"},
+    // A prefix declared on an element is gone once it ends, whatever is declared next.
+    {"ElementPrefixesEndWithTheirElement", "",
+     R"(<xs:element name="a" type="q:T" xmlns:q="urn:q"/>
+        <xs:element name="b" type="q:T" xmlns:r="urn:r"/>)",
+     "global element name=a type={urn:q}T\n"
+     "global element name=b type=T\n",
+     "512 0 xmlns in element attrs\n512 0 xmlns in element attrs\n"},
     {"BareNamesResolveByRole", kTns,
      R"(<xs:element name="a" type="string"/>
         <xs:element ref="a"/>
