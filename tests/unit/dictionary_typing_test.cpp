@@ -112,16 +112,16 @@ TEST(PatternScan, CursorStopsWhereTheScanEnds) {
     const ScanCase branches[] = {{"ab|cdef", 2, 3}, {"", 0, 0},          {"a*b", -1, 1},
                                  {"(x|yy)z", 3, 7}, {"a\\", 2, 2},       {"\\p{Lu", 1, 5},
                                  {"ab)c", 4, 4},    {"[a-z]{2}|q", 2, 9}};
-    const ScanCase specs[] = {{"5}", 5, 2},  {"2,8}", 8, 4}, {",8}", 8, 3}, {"3,}", -1, 3},
-                              {"0}", -1, 2}, {"}", -1, 1},   {"5", -1, 1},  {"5,x}", -1, 2},
-                              {"", -1, 0},   {"0,0}", 0, 4}};
+    const ScanCase quantifiers[] = {{"5}", 5, 2},  {"2,8}", 8, 4}, {",8}", 8, 3}, {"3,}", -1, 3},
+                                    {"0}", -1, 2}, {"}", -1, 1},   {"5", -1, 1},  {"5,x}", -1, 2},
+                                    {"", -1, 0},   {"0,0}", 0, 4}};
     for (const ScanCase& c : branches) {
         auto text = exactText(c.text);
         const char16_t* cursor = text.get();
         EXPECT_EQ(branchLength(cursor), c.result) << c.text;
         EXPECT_EQ(size_t(cursor - text.get()), c.consumed) << c.text;
     }
-    for (const ScanCase& c : specs) {
+    for (const ScanCase& c : quantifiers) {
         auto text = exactText(c.text);
         const char16_t* cursor = text.get();
         EXPECT_EQ(lengthSpec(cursor), c.result) << c.text;
