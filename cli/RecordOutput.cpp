@@ -1,6 +1,7 @@
 #include "RecordOutput.h"
 
 #include "TextOutput.h"
+#include "zrstring.h"
 
 #include <algorithm>
 #include <cerrno>
@@ -181,7 +182,7 @@ class RecordTable {
             Row& row = rows_[count++];
             const ZrDType& type = field->DataType();
             row.name.clear();
-            appendUtf8(row.name, field->FieldName().view());
+            zrAppendUtf8(row.name, field->FieldName().view());
             row.alias = type.Alias();
             row.widths[kField] = displayWidth(row.name);
             row.widths[kType] = displayWidth(row.alias);
@@ -204,7 +205,7 @@ class RecordTable {
         }
 
         text_.clear();
-        appendUtf8(text_, record.name.view());
+        zrAppendUtf8(text_, record.name.view());
         text_ += " (length ";
         appendNumber(text_, record.RecordLength());
         text_ += ", ";
@@ -329,7 +330,7 @@ class TreePrinter {
             shown_[at] = true;
         }
         line_.clear();
-        appendUtf8(line_, record.name.view());
+        zrAppendUtf8(line_, record.name.view());
         line_ += " (length ";
         appendNumber(line_, record.RecordLength());
         line_ += ")\n";
@@ -379,7 +380,7 @@ class TreePrinter {
                 appendNumber(line_, static_cast<long long>(stack_.size()));
                 line_ += "] ";
             }
-            appendUtf8(line_, field->FieldName().view());
+            zrAppendUtf8(line_, field->FieldName().view());
             line_ += ": ";
             line_ += type.Alias();
             line_ += ", length ";
@@ -486,7 +487,7 @@ class GraphPrinter {
     void printNode(size_t id) {
         const ZrRecord& record = *order_[id];
         std::string name;
-        appendUtf8(name, record.name.view());
+        zrAppendUtf8(name, record.name.view());
         line_ = "  r";
         appendNumber(line_, static_cast<long long>(id));
         line_ += " [label=<<table border=\"0\" cellborder=\"1\" cellspacing=\"0\" "
@@ -500,7 +501,7 @@ class GraphPrinter {
             const ZrDType& type = field->DataType();
             line_ += "<tr><td align=\"left\">";
             name.clear();
-            appendUtf8(name, field->FieldName().view());
+            zrAppendUtf8(name, field->FieldName().view());
             appendLabelText(line_, name);
             line_ += "</td><td align=\"left\">";
             appendLabelText(line_, type.Alias());
@@ -519,7 +520,7 @@ class GraphPrinter {
             if (!field || !isRecordField(*field))
                 continue;
             name.clear();
-            appendUtf8(name, field->FieldName().view());
+            zrAppendUtf8(name, field->FieldName().view());
             line_ = "  r";
             appendNumber(line_, static_cast<long long>(id));
             line_ += " -> ";

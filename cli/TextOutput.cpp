@@ -1,5 +1,7 @@
 #include "TextOutput.h"
 
+#include "zrstring.h"
+
 OutputBuffer::OutputBuffer(std::ostream& out) : out_(out) { pending_.reserve(kFlushAt); }
 
 OutputBuffer::~OutputBuffer() { flush(); }
@@ -63,20 +65,6 @@ void appendEscapedAscii(std::string& out, unsigned char c) {
     } else {
         out += static_cast<char>(c);
     }
-}
-
-void appendCodePoint(std::string& out, char32_t c) {
-    if (c < 0x800) {
-        out += static_cast<char>(0xC0 | (c >> 6));
-    } else if (c < 0x10000) {
-        out += static_cast<char>(0xE0 | (c >> 12));
-        out += static_cast<char>(0x80 | ((c >> 6) & 0x3F));
-    } else {
-        out += static_cast<char>(0xF0 | (c >> 18));
-        out += static_cast<char>(0x80 | ((c >> 12) & 0x3F));
-        out += static_cast<char>(0x80 | ((c >> 6) & 0x3F));
-    }
-    out += static_cast<char>(0x80 | (c & 0x3F));
 }
 
 // The range the second byte of a sequence must fall in, by its lead byte (Unicode's
@@ -152,24 +140,6 @@ void appendValidUtf8(std::string& out, std::string_view text) {
     }
 }
 
-void appendUtf8(std::string& out, std::u16string_view text) {
-    const size_t n = text.size();
-    for (size_t i = 0; i < n; ++i) {
-        const char16_t u = text[i];
-        if (u < 0x80) {
-            out += static_cast<char>(u);
-        } else if (u < 0xD800 || u > 0xDFFF) {
-            appendCodePoint(out, u);
-        } else if (u <= 0xDBFF && i + 1 < n && text[i + 1] >= 0xDC00 && text[i + 1] <= 0xDFFF) {
-            appendCodePoint(out, 0x10000 + ((static_cast<char32_t>(u) - 0xD800) << 10) +
-                                     (static_cast<char32_t>(text[i + 1]) - 0xDC00));
-            ++i;
-        } else {
-            out += kReplacement;
-        }
-    }
-}
-
 void appendJsonEscaped(std::string& out, std::string_view text) {
     const auto* bytes = reinterpret_cast<const unsigned char*>(text.data());
     const size_t n = text.size();
@@ -201,21 +171,23 @@ void appendJsonEscaped(std::string& out, std::string_view text) {
 
 void appendJsonEscaped(std::string& out, std::u16string_view text) {
     const size_t n = text.size();
-    for (size_t i = 0; i < n; ++i) {
+    size_t i = 0;
+    while (i < n) {
         const char16_t u = text[i];
         if (u < 0x80) {
             if (plain(static_cast<unsigned char>(u)))
                 out += static_cast<char>(u);
             else
                 appendEscapedAscii(out, static_cast<unsigned char>(u));
-        } else if (u < 0xD800 || u > 0xDFFF) {
-            appendCodePoint(out, u);
-        } else if (u <= 0xDBFF && i + 1 < n && text[i + 1] >= 0xDC00 && text[i + 1] <= 0xDFFF) {
-            appendCodePoint(out, 0x10000 + ((static_cast<char32_t>(u) - 0xD800) << 10) +
-                                     (static_cast<char32_t>(text[i + 1]) - 0xDC00));
             ++i;
-        } else {
-            out += kReplacement;
+            continue;
         }
+        // Nothing beyond ASCII is escaped: a run of it converts as the host converts,
+        // and a surrogate pair never straddles two runs.
+        size_t run = i + 1;
+        while (run < n && text[run] >= 0x80)
+            ++run;
+        zrAppendUtf8(out, text.substr(i, run - i));
+        i = run;
     }
 }

@@ -36,9 +36,6 @@ size_t wellFormedLength(std::string_view text, size_t at);
 size_t illFormedLength(std::string_view text, size_t at);
 // Appends `text` with each maximal ill-formed part replaced by U+FFFD.
 void appendValidUtf8(std::string& out, std::string_view text);
-// Appends 16-bit host text as UTF-8, as zrUtf16ToUtf8 converts it: a surrogate
-// without its partner becomes U+FFFD.
-void appendUtf8(std::string& out, std::u16string_view text);
 
 // Appends `text` as the inside of a JSON string: quotation mark, backslash and the
 // control characters escaped as nlohmann-json escapes them (\b \t \n \f \r, else

@@ -16,24 +16,6 @@ void appendCodePoint(std::u16string& out, char32_t cp) {
     }
 }
 
-void appendUtf8(std::string& out, char32_t cp) {
-    if (cp < 0x80) {
-        out += static_cast<char>(cp);
-    } else if (cp < 0x800) {
-        out += static_cast<char>(0xC0 | (cp >> 6));
-        out += static_cast<char>(0x80 | (cp & 0x3F));
-    } else if (cp < 0x10000) {
-        out += static_cast<char>(0xE0 | (cp >> 12));
-        out += static_cast<char>(0x80 | ((cp >> 6) & 0x3F));
-        out += static_cast<char>(0x80 | (cp & 0x3F));
-    } else {
-        out += static_cast<char>(0xF0 | (cp >> 18));
-        out += static_cast<char>(0x80 | ((cp >> 12) & 0x3F));
-        out += static_cast<char>(0x80 | ((cp >> 6) & 0x3F));
-        out += static_cast<char>(0x80 | (cp & 0x3F));
-    }
-}
-
 // Byte count of a narrow text given with an optional length, never reading past a
 // terminator.
 size_t narrowLength(const char* text, long len) {
@@ -122,22 +104,41 @@ std::u16string zrUtf8ToUtf16(std::string_view text) {
 
 std::string zrUtf16ToUtf8(std::u16string_view text) {
     std::string out;
-    out.reserve(text.size());
-    const size_t n = text.size();
-    for (size_t i = 0; i < n; ++i) {
-        const char16_t u = text[i];
-        if (u >= 0xD800 && u <= 0xDBFF && i + 1 < n && text[i + 1] >= 0xDC00 &&
-            text[i + 1] <= 0xDFFF) {
-            appendUtf8(out, 0x10000 + ((static_cast<char32_t>(u) - 0xD800) << 10) +
-                                (static_cast<char32_t>(text[i + 1]) - 0xDC00));
-            ++i;
-        } else if (u >= 0xD800 && u <= 0xDFFF) {
-            appendUtf8(out, kReplacement);
-        } else {
-            appendUtf8(out, u);
-        }
-    }
+    zrAppendUtf8(out, text);
     return out;
+}
+
+// Written into space of three bytes a unit, the most one takes (a pair takes four for
+// its two), and cut to what was written.
+void zrAppendUtf8(std::string& out, std::u16string_view text) {
+    const size_t n = text.size();
+    const size_t start = out.size();
+    out.resize(start + 3 * n);
+    char* p = out.data() + start;
+    for (size_t i = 0; i < n; ++i) {
+        char32_t c = text[i];
+        if (c < 0x80) {
+            *p++ = static_cast<char>(c);
+            continue;
+        }
+        if (c >= 0xD800 && c <= 0xDBFF && i + 1 < n && text[i + 1] >= 0xDC00 &&
+            text[i + 1] <= 0xDFFF)
+            c = 0x10000 + ((c - 0xD800) << 10) + (static_cast<char32_t>(text[++i]) - 0xDC00);
+        else if (c >= 0xD800 && c <= 0xDFFF)
+            c = kReplacement;
+        if (c < 0x800) {
+            *p++ = static_cast<char>(0xC0 | (c >> 6));
+        } else if (c < 0x10000) {
+            *p++ = static_cast<char>(0xE0 | (c >> 12));
+            *p++ = static_cast<char>(0x80 | ((c >> 6) & 0x3F));
+        } else {
+            *p++ = static_cast<char>(0xF0 | (c >> 18));
+            *p++ = static_cast<char>(0x80 | ((c >> 12) & 0x3F));
+            *p++ = static_cast<char>(0x80 | ((c >> 6) & 0x3F));
+        }
+        *p++ = static_cast<char>(0x80 | (c & 0x3F));
+    }
+    out.resize(static_cast<size_t>(p - out.data()));
 }
 
 ZrWString& ZrWString::CopyN(const ZrWChar* text, long count, int /*flags*/) {

@@ -201,3 +201,6 @@ class ZRHOST_API ZrXString {
 // UTF-8 <-> UTF-16 conversions used by the host classes and host programs.
 ZRHOST_API std::u16string zrUtf8ToUtf16(std::string_view text);
 ZRHOST_API std::string zrUtf16ToUtf8(std::u16string_view text);
+// Appends `text` as UTF-8 to `out`, as zrUtf16ToUtf8 converts it: a surrogate without
+// its partner becomes U+FFFD.
+ZRHOST_API void zrAppendUtf8(std::string& out, std::u16string_view text);

@@ -61,7 +61,7 @@ TEST(Escaping, MatchesTheDocumentLibraryAndTheHostsConversion) {
         const std::string viaHost = zrUtf16ToUtf8(text);
         EXPECT_EQ(escaped(text), referenceEscape(viaHost)) << ::testing::PrintToString(viaHost);
         std::string converted;
-        appendUtf8(converted, text);
+        zrAppendUtf8(converted, text);
         EXPECT_EQ(converted, viaHost);
     }
 
