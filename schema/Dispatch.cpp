@@ -1,5 +1,6 @@
 #include "SchemaReader.h"
 #include "zrglob.h"
+#include "zrstring.h"
 
 #include <memory>
 #include <string>
@@ -243,87 +244,43 @@ void SchemaReader::doAnnotation(xercesc::AttributeList&) {
         docOwner = lastOpened;
 }
 
-// White space runs become single blanks as the text arrives, none leading, and the
-// text is written in UTF-8 as fields carry it (a lone surrogate becomes U+FFFD, as the
-// host's own conversion does). The parser may hand one text in several pieces: a run
-// of white space or a surrogate pair may span two of them.
+// White space runs become single blanks as the text arrives, none leading; the parser
+// may hand one text in several pieces, and a run may span two of them. One pass over
+// the characters, written straight into the text's own space.
 void SchemaReader::characters(const XMLCh* chars, XMLSize_t length) {
     if (docDepth == 0)
         return;
     const size_t kept = docText.size();
-    // Three bytes a unit at most, and before the first a blank and a pending lone
-    // high surrogate's replacement.
-    docText.resize(kept + 3 * length + 5);
-    char* const begin = docText.data();
-    char* out = begin + kept;
+    docText.resize(kept + length + 1);
+    char16_t* const begin = docText.data();
+    char16_t* out = begin + kept;
     bool blank = docBlank;
-    const auto put = [&](char32_t c) {
-        if (blank && out != begin)
-            *out++ = ' ';
-        blank = false;
-        if (c < 0x80) {
-            *out++ = char(c);
-            return;
-        }
-        if (c < 0x800) {
-            *out++ = char(0xC0 | (c >> 6));
-        } else if (c < 0x10000) {
-            *out++ = char(0xE0 | (c >> 12));
-            *out++ = char(0x80 | ((c >> 6) & 0x3F));
-        } else {
-            *out++ = char(0xF0 | (c >> 18));
-            *out++ = char(0x80 | ((c >> 12) & 0x3F));
-            *out++ = char(0x80 | ((c >> 6) & 0x3F));
-        }
-        *out++ = char(0x80 | (c & 0x3F));
-    };
-    const XMLCh* const end = chars + length;
-    for (; chars != end; ++chars) {
-        // Most text is runs of printable ASCII: those are copied as they stand.
-        if (*chars > u' ' && *chars < 0x80 && docHigh == 0) {
-            if (blank && out != begin)
-                *out++ = ' ';
-            blank = false;
-            do
-                *out++ = char(*chars++);
-            while (chars != end && *chars > u' ' && *chars < 0x80);
-            if (chars == end)
-                break;
-        }
-        const char32_t c = *chars;
-        if (docHigh != 0) {
-            const char32_t high = std::exchange(docHigh, u'\0');
-            if (c >= 0xDC00 && c <= 0xDFFF) {
-                put(0x10000 + ((high - 0xD800) << 10) + (c - 0xDC00));
-                continue;
-            }
-            put(0xFFFD);
-        }
-        if (c <= u' ' && (c == u' ' || c == u'\t' || c == u'\n' || c == u'\r'))
+    for (const XMLCh* const end = chars + length; chars != end; ++chars) {
+        const char16_t c = *chars;
+        if (c <= u' ' && (c == u' ' || c == u'\t' || c == u'\n' || c == u'\r')) {
             blank = true;
-        else if (c >= 0xD800 && c <= 0xDBFF)
-            docHigh = char16_t(c);
-        else
-            put(c >= 0xDC00 && c <= 0xDFFF ? 0xFFFD : c);
+            continue;
+        }
+        if (blank && out != begin)
+            *out++ = u' ';
+        blank = false;
+        *out++ = c;
     }
     docBlank = blank;
     docText.resize(size_t(out - begin));
 }
 
-// A documentation without text leaves the next one to be read.
+// A documentation without text leaves the next one to be read. The text becomes
+// UTF-8 once here, as fields carry it, whatever number of fields it describes.
 void SchemaReader::finishDocumentation() {
-    if (docHigh != 0) {
-        if (docBlank && !docText.empty())
-            docText += ' ';
-        docText += "\xEF\xBF\xBD";
-        docHigh = 0;
-    }
     docDepth = 0;
     docBlank = false;
     if (docText.empty())
         return;
-    Description text = std::make_shared<const std::string>(docText);
+    std::string utf8;
+    zrAppendUtf8(utf8, docText);
     docText.clear();
+    Description text = std::make_shared<const std::string>(std::move(utf8));
     if (docOwner == DocOwner::Element)
         currentElement.documentation = std::move(text);
     else if (docOwner == DocOwner::ComplexType)

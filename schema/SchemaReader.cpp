@@ -233,7 +233,6 @@ void SchemaReader::resetOpenComponents() {
     docDepth = 0;
     docText.clear();
     docBlank = false;
-    docHigh = 0;
 }
 
 // Formatting the message may itself run out of memory; nothing may leave the read.

@@ -376,11 +376,8 @@ class SchemaReader : public xercesc::HandlerBase {
     int32_t openedDepth = 0;
     DocOwner docOwner = DocOwner::None;
     int32_t docDepth = 0;
-    // The text gathered so far, in UTF-8; a high surrogate whose low half has not
-    // arrived yet.
-    std::string docText;
+    std::u16string docText;
     bool docBlank = false;
-    char16_t docHigh = 0;
 
     // For each open "group"/"attributeGroup" element: whether its start opened a
     // definition (true) or was a reference (false).
