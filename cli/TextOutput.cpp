@@ -126,18 +126,24 @@ size_t illFormedLength(std::string_view text, size_t at) {
     return wellFormedPrefix(text, at, length);
 }
 
-void appendValidUtf8(std::string& out, std::string_view text) {
-    size_t i = 0;
-    while (i < text.size()) {
-        const size_t length = wellFormedLength(text, i);
-        if (length > 0) {
-            out.append(text.data() + i, length);
-            i += length;
-        } else {
-            out += kReplacement;
-            i += illFormedLength(text, i);
-        }
+namespace {
+
+// Appends the sequence at `at` if well-formed, else one U+FFFD for its ill-formed
+// part; returns the bytes taken.
+size_t appendSequence(std::string& out, std::string_view text, size_t at) {
+    if (const size_t length = wellFormedLength(text, at); length > 0) {
+        out.append(text.data() + at, length);
+        return length;
     }
+    out += kReplacement;
+    return illFormedLength(text, at);
+}
+
+} // namespace
+
+void appendValidUtf8(std::string& out, std::string_view text) {
+    for (size_t i = 0; i < text.size();)
+        i += appendSequence(out, text, i);
 }
 
 void appendJsonEscaped(std::string& out, std::string_view text) {
@@ -158,14 +164,7 @@ void appendJsonEscaped(std::string& out, std::string_view text) {
             ++i;
             continue;
         }
-        const size_t length = wellFormedLength(text, i);
-        if (length > 0) {
-            out.append(text.data() + i, length);
-            i += length;
-        } else {
-            out += kReplacement;
-            i += illFormedLength(text, i);
-        }
+        i += appendSequence(out, text, i);
     }
 }
 
