@@ -108,12 +108,26 @@ std::string zrUtf16ToUtf8(std::u16string_view text) {
     return out;
 }
 
-// Written into space of three bytes a unit, the most one takes (a pair takes four for
-// its two), and cut to what was written.
+// Measured first, so that the text takes exactly its space, then written into it.
 void zrAppendUtf8(std::string& out, std::u16string_view text) {
     const size_t n = text.size();
+    size_t bytes = 0;
+    for (size_t i = 0; i < n; ++i) {
+        const char16_t u = text[i];
+        if (u < 0x80) {
+            bytes += 1;
+        } else if (u < 0x800) {
+            bytes += 2;
+        } else if (u >= 0xD800 && u <= 0xDBFF && i + 1 < n && text[i + 1] >= 0xDC00 &&
+                   text[i + 1] <= 0xDFFF) {
+            bytes += 4;
+            ++i;
+        } else {
+            bytes += 3; // a lone surrogate's replacement too
+        }
+    }
     const size_t start = out.size();
-    out.resize(start + 3 * n);
+    out.resize(start + bytes);
     char* p = out.data() + start;
     for (size_t i = 0; i < n; ++i) {
         char32_t c = text[i];
@@ -138,7 +152,6 @@ void zrAppendUtf8(std::string& out, std::u16string_view text) {
         }
         *p++ = static_cast<char>(0x80 | (c & 0x3F));
     }
-    out.resize(static_cast<size_t>(p - out.data()));
 }
 
 ZrWString& ZrWString::CopyN(const ZrWChar* text, long count, int /*flags*/) {
