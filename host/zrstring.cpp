@@ -109,8 +109,22 @@ std::string zrUtf16ToUtf8(std::u16string_view text) {
 }
 
 // Measured first, so that the text takes exactly its space, then written into it.
+// Text that is all ASCII, as names and most documentation are, is one narrowing
+// copy: both loops of that path are free of branches the compiler cannot turn into
+// vector code.
 void zrAppendUtf8(std::string& out, std::u16string_view text) {
     const size_t n = text.size();
+    char16_t units = 0;
+    for (const char16_t u : text)
+        units |= u;
+    if (units < 0x80) {
+        const size_t start = out.size();
+        out.resize(start + n);
+        char* p = out.data() + start;
+        for (size_t i = 0; i < n; ++i)
+            p[i] = static_cast<char>(text[i]);
+        return;
+    }
     size_t bytes = 0;
     for (size_t i = 0; i < n; ++i) {
         const char16_t u = text[i];

@@ -246,25 +246,30 @@ void SchemaReader::doAnnotation(xercesc::AttributeList&) {
 
 // White space runs become single blanks as the text arrives, none leading; the parser
 // may hand one text in several pieces, and a run may span two of them. One pass over
-// the characters, written straight into the text's own space.
+// the characters, written straight into the text's own space, a word at a time.
 void SchemaReader::characters(const XMLCh* chars, XMLSize_t length) {
     if (docDepth == 0)
         return;
+    const auto isSpace = [](char16_t c) {
+        return c <= u' ' && (c == u' ' || c == u'\t' || c == u'\n' || c == u'\r');
+    };
     const size_t kept = docText.size();
     docText.resize(kept + length + 1);
     char16_t* const begin = docText.data();
     char16_t* out = begin + kept;
     bool blank = docBlank;
-    for (const XMLCh* const end = chars + length; chars != end; ++chars) {
-        const char16_t c = *chars;
-        if (c <= u' ' && (c == u' ' || c == u'\t' || c == u'\n' || c == u'\r')) {
+    for (const XMLCh* const end = chars + length; chars != end;) {
+        if (isSpace(*chars)) {
             blank = true;
+            ++chars;
             continue;
         }
         if (blank && out != begin)
             *out++ = u' ';
         blank = false;
-        *out++ = c;
+        do
+            *out++ = *chars++;
+        while (chars != end && !isSpace(*chars));
     }
     docBlank = blank;
     docText.resize(size_t(out - begin));
