@@ -52,7 +52,8 @@ DefinitionItems definitionItems(const ZrDType& type) {
     const ZrDType::Definition* def = type.Parsed();
     if (!def)
         return found;
-    for (const auto& [key, value] : def->items) {
+    for (const auto& [item, value] : def->items) {
+        const std::string_view key = item;
         if (!found.maxLength && key == "maxlength")
             found.maxLength = &value;
         else if (!found.picture && key == "picture")

@@ -168,25 +168,19 @@ void appendJsonEscaped(std::string& out, std::string_view text) {
     }
 }
 
+// Only ASCII is ever escaped, so a run of everything else, converted as the host
+// converts, never splits a surrogate pair.
 void appendJsonEscaped(std::string& out, std::u16string_view text) {
     const size_t n = text.size();
     size_t i = 0;
     while (i < n) {
-        const char16_t u = text[i];
-        if (u < 0x80) {
-            if (plain(static_cast<unsigned char>(u)))
-                out += static_cast<char>(u);
-            else
-                appendEscapedAscii(out, static_cast<unsigned char>(u));
-            ++i;
-            continue;
-        }
-        // Nothing beyond ASCII is escaped: a run of it converts as the host converts,
-        // and a surrogate pair never straddles two runs.
-        size_t run = i + 1;
-        while (run < n && text[run] >= 0x80)
+        size_t run = i;
+        while (run < n && (text[run] >= 0x80 || plain(static_cast<unsigned char>(text[run]))))
             ++run;
         zrAppendUtf8(out, text.substr(i, run - i));
-        i = run;
+        if (run == n)
+            break;
+        appendEscapedAscii(out, static_cast<unsigned char>(text[run]));
+        i = run + 1;
     }
 }
