@@ -62,14 +62,21 @@ void SchemaReader::beginTypeDefinition(xercesc::AttributeList& attrs, SimpleType
     }
 }
 
-void SchemaReader::finishComplexType() {
-    if (complexTypeStack.empty())
-        return;
+// Stores the finished definition and brings back the one it stood in. The model
+// keeps every definition's content for the whole read, so its spare room goes.
+void SchemaReader::storeDefinition() {
+    currentComplexType.content.shrink_to_fit();
     model.complexTypes.push_back(std::move(currentComplexType));
     currentComplexType = std::move(complexTypeStack.back());
     complexTypeStack.pop_back();
     complexElementDepths.pop_back();
     --complexDepth;
+}
+
+void SchemaReader::finishComplexType() {
+    if (complexTypeStack.empty())
+        return;
+    storeDefinition();
     typeTarget = &currentComplexType;
 }
 
@@ -149,9 +156,5 @@ void SchemaReader::finishGroup() {
     groupOpenedDefinition.pop_back();
     if (!openedDefinition || complexTypeStack.empty())
         return;
-    model.complexTypes.push_back(std::move(currentComplexType));
-    currentComplexType = std::move(complexTypeStack.back());
-    complexTypeStack.pop_back();
-    complexElementDepths.pop_back();
-    --complexDepth;
+    storeDefinition();
 }

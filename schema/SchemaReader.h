@@ -162,6 +162,7 @@ class SchemaReader : public xercesc::HandlerBase {
     void finishElement();
     void doComplexType(xercesc::AttributeList& attrs);
     void beginTypeDefinition(xercesc::AttributeList& attrs, SimpleTypeDef& type);
+    void storeDefinition();
     void finishComplexType();
     void doExtension(xercesc::AttributeList& attrs);
     void doGroup(xercesc::AttributeList& attrs);
