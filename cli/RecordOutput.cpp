@@ -216,23 +216,39 @@ class RecordTable {
             cell(c, kTitles[c], kTitles[c].size());
         text_ += '\n';
 
+        // Every line fits in the widths of its columns and their separators; it is
+        // written into that room and the room it did not use is given back.
+        size_t lineRoom = 3;
+        for (size_t c = 0; c < columns_; ++c)
+            lineRoom += widths_[c] + 2;
         for (size_t f = 0; f < count; ++f) {
             const Row& row = rows_[f];
-            text_ += "  ";
-            cell(kField, row.name, row.widths[kField]);
-            cell(kType, row.alias, row.widths[kType]);
+            // Widths count code points; the room is counted in bytes.
+            const size_t multibyte = row.name.size() - row.widths[kField] + row.alias.size() -
+                                     row.widths[kType] + row.description.size() -
+                                     row.widths[kDescription];
+            const size_t start = text_.size();
+            text_.resize(start + lineRoom + multibyte);
+            char* const begin = text_.data() + start;
+            char* p = begin;
+            *p++ = ' ';
+            *p++ = ' ';
+            p = cell(p, kField, row.name, row.widths[kField]);
+            p = cell(p, kType, row.alias, row.widths[kType]);
             size_t at = 0;
             for (size_t c = kUsage; c <= kDecimals; ++c) {
-                cell(c, std::string_view(row.numbers).substr(at, row.widths[c]), row.widths[c]);
+                p = cell(p, c, std::string_view(row.numbers).substr(at, row.widths[c]),
+                         row.widths[c]);
                 at += row.widths[c];
             }
-            cell(kNulls, row.nulls ? "yes" : "no", row.widths[kNulls]);
+            p = cell(p, kNulls, row.nulls ? "yes" : "no", row.widths[kNulls]);
             if (columns_ == kColumns && !row.description.empty())
-                cell(kDescription, row.description, row.widths[kDescription]);
+                p = cell(p, kDescription, row.description, row.widths[kDescription]);
             // A field without a description ends in the padding of its nulls cell.
-            while (columns_ == kColumns && text_.back() == ' ')
-                text_.pop_back();
-            text_ += '\n';
+            while (columns_ == kColumns && p[-1] == ' ')
+                --p;
+            *p++ = '\n';
+            text_.resize(start + size_t(p - begin));
             // A record of many fields goes out in pieces, not held whole.
             if (text_.size() >= (1 << 16)) {
                 out.write(text_);
@@ -253,16 +269,28 @@ class RecordTable {
         size_t widths[kColumns] = {};
     };
 
+    // The title line's cells.
     void cell(size_t column, std::string_view text, size_t width) {
-        if (column > 0)
-            text_ += "  ";
+        const size_t start = text_.size();
+        text_.resize(start + widths_[column] + 2 + text.size());
+        char* const begin = text_.data() + start;
+        text_.resize(start + size_t(cell(begin, column, text, width) - begin));
+    }
+
+    // Writes one cell at `p`, with the separator before it, and returns where it ends.
+    char* cell(char* p, size_t column, std::string_view text, size_t width) const {
+        if (column > 0) {
+            *p++ = ' ';
+            *p++ = ' ';
+        }
         const size_t padding = column + 1 < columns_ ? widths_[column] - width : 0;
         const bool right = column >= kUsage && column <= kDecimals;
         if (right)
-            text_.append(padding, ' ');
-        text_ += text;
+            p = std::fill_n(p, padding, ' ');
+        p = std::copy(text.begin(), text.end(), p);
         if (!right)
-            text_.append(padding, ' ');
+            p = std::fill_n(p, padding, ' ');
+        return p;
     }
 
     std::vector<Row> rows_;
