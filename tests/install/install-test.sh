@@ -83,6 +83,9 @@ package)
     deb="$(ls "$work"/zrbxmls_*.deb)"
     depends="$(dpkg-deb -f "$deb" Depends)"
     [[ "$depends" == *libxerces-c3.2* ]] || fail "Depends lacks the Xerces-C runtime: $depends"
+    if readelf -d "$build/bin/zrdict" | grep -q 'libmimalloc'; then
+        [[ "$depends" == *libmimalloc* ]] || fail "Depends lacks zrdict's allocator: $depends"
+    fi
     dpkg-deb -x "$deb" "$work/root"
     check_zrdict "$work/root/usr"
     ;;
