@@ -244,48 +244,75 @@ void SchemaReader::doAnnotation(xercesc::AttributeList&) {
         docOwner = lastOpened;
 }
 
-// White space runs become single blanks as the text arrives, none leading; the parser
-// may hand one text in several pieces, and a run may span two of them. One pass over
-// the characters, written straight into the text's own space, a word at a time.
-void SchemaReader::characters(const XMLCh* chars, XMLSize_t length) {
-    if (docDepth == 0)
-        return;
+namespace {
+
+// Appends `chars` to `text` with white space runs made single blanks, none leading;
+// `blank` carries a run over from one piece of the text to the next. One pass,
+// written straight into the text's own space, a word at a time.
+template <class Char>
+void appendCollapsed(std::basic_string<Char>& text, const XMLCh* chars, const XMLCh* end,
+                     bool& blank) {
     const auto isSpace = [](char16_t c) {
         return c <= u' ' && (c == u' ' || c == u'\t' || c == u'\n' || c == u'\r');
     };
-    const size_t kept = docText.size();
-    docText.resize(kept + length + 1);
-    char16_t* const begin = docText.data();
-    char16_t* out = begin + kept;
-    bool blank = docBlank;
-    for (const XMLCh* const end = chars + length; chars != end;) {
+    const size_t kept = text.size();
+    text.resize(kept + size_t(end - chars) + 1);
+    Char* const begin = text.data();
+    Char* out = begin + kept;
+    while (chars != end) {
         if (isSpace(*chars)) {
             blank = true;
             ++chars;
             continue;
         }
         if (blank && out != begin)
-            *out++ = u' ';
+            *out++ = Char(' ');
         blank = false;
         do
-            *out++ = *chars++;
+            *out++ = static_cast<Char>(*chars++);
         while (chars != end && !isSpace(*chars));
     }
-    docBlank = blank;
-    docText.resize(size_t(out - begin));
+    text.resize(size_t(out - begin));
 }
 
-// A documentation without text leaves the next one to be read. The text becomes
-// UTF-8 once here, as fields carry it, whatever number of fields it describes.
+} // namespace
+
+// The parser may hand one text over in several pieces, and a white space run may
+// span two of them.
+void SchemaReader::characters(const XMLCh* chars, XMLSize_t length) {
+    if (docDepth == 0)
+        return;
+    const XMLCh* const end = chars + length;
+    if (!docWide) {
+        char16_t units = 0;
+        for (const XMLCh* c = chars; c != end; ++c)
+            units |= *c;
+        if (units < 0x80) {
+            appendCollapsed(docText, chars, end, docBlank);
+            return;
+        }
+        docWideText.assign(docText.begin(), docText.end());
+        docText.clear();
+        docWide = true;
+    }
+    appendCollapsed(docWideText, chars, end, docBlank);
+}
+
+// A documentation without text leaves the next one to be read. The text is UTF-8
+// from here on, as fields carry it, whatever number of fields it describes.
 void SchemaReader::finishDocumentation() {
     docDepth = 0;
     docBlank = false;
+    if (docWide)
+        zrAppendUtf8(docText, docWideText);
+    docWideText.clear();
+    docWide = false;
     if (docText.empty())
         return;
-    std::string utf8;
-    zrAppendUtf8(utf8, docText);
+    // A copy, so that the text takes only its own room and the gathering buffer
+    // keeps its capacity for the next documentation.
+    Description text = std::make_shared<const std::string>(docText);
     docText.clear();
-    Description text = std::make_shared<const std::string>(std::move(utf8));
     if (docOwner == DocOwner::Element)
         currentElement.documentation = std::move(text);
     else if (docOwner == DocOwner::ComplexType)

@@ -232,6 +232,8 @@ void SchemaReader::resetOpenComponents() {
     docOwner = DocOwner::None;
     docDepth = 0;
     docText.clear();
+    docWideText.clear();
+    docWide = false;
     docBlank = false;
 }
 

@@ -377,7 +377,12 @@ class SchemaReader : public xercesc::HandlerBase {
     int32_t openedDepth = 0;
     DocOwner docOwner = DocOwner::None;
     int32_t docDepth = 0;
-    std::u16string docText;
+    // The gathered text: UTF-8 while it is all ASCII, as nearly all documentation
+    // is, so that it needs no conversion; 16-bit text from the first other character
+    // on (docWide), since the parser may hand a surrogate pair over in two pieces.
+    std::string docText;
+    std::u16string docWideText;
+    bool docWide = false;
     bool docBlank = false;
 
     // For each open "group"/"attributeGroup" element: whether its start opened a
