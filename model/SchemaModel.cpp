@@ -81,4 +81,5 @@ void SchemaModel::clear() {
     occurrenceRead = false;
     documentationRead = false;
     names.clear();
+    descriptions.clear();
 }

@@ -20,6 +20,26 @@
 // by every copy of the declaration or type it documents and every field it describes.
 using Description = std::shared_ptr<const std::string>;
 
+// The descriptions of one read, kept together. Every description handed out shares
+// the store's one count, so copying one into a field, or letting one go, touches that
+// count and not a block of each text's own. The texts stay while any description of
+// the read does.
+class DescriptionStore {
+  public:
+    Description add(std::string_view text) {
+        if (!texts_)
+            texts_ = std::make_shared<std::deque<std::string>>();
+        texts_->emplace_back(text);
+        return Description(texts_, &texts_->back());
+    }
+
+    // Descriptions already handed out keep their texts.
+    void clear() { texts_.reset(); }
+
+  private:
+    std::shared_ptr<std::deque<std::string>> texts_;
+};
+
 // One "element" or "attribute" declaration, a reference to a global element, or a
 // reference to a group. Kind, in the order record building tests it: refName set
 // (element reference), else groupName set (group reference), else a declaration.
@@ -408,6 +428,7 @@ struct SchemaModel {
     bool documentationRead = false;
     // One shared copy of each name, namespace and facet value the model holds.
     ZrNamePool names;
+    DescriptionStore descriptions;
 
     void clear();
 

@@ -311,7 +311,7 @@ void SchemaReader::finishDocumentation() {
         return;
     // A copy, so that the text takes only its own room and the gathering buffer
     // keeps its capacity for the next documentation.
-    Description text = std::make_shared<const std::string>(docText);
+    Description text = model.descriptions.add(docText);
     docText.clear();
     if (docOwner == DocOwner::Element)
         currentElement.documentation = std::move(text);
