@@ -1,6 +1,8 @@
 #include "SchemaReader.h"
 #include "zrglob.h"
 
+#include <iterator>
+
 namespace {
 
 // Gives a component without a name the next generated one (see isGeneratedName).
@@ -13,19 +15,23 @@ void nameIfAnonymous(ZrName& name, int32_t& anonCount) {
     name = generated.view();
 }
 
-// Saves the working complex type on the stack and leaves it cleared; the content
-// moves.
-void saveComplexType(ComplexTypeDef& working, std::vector<ComplexTypeDef>& stack) {
-    stack.push_back(std::move(working));
-    working.clear();
-}
-
 } // namespace
+
+// Saves the working complex type on the stack and leaves it cleared; the content
+// moves, and the new definition's content grows in room a finished one gave back.
+void SchemaReader::saveComplexType() {
+    complexTypeStack.push_back(std::move(currentComplexType));
+    currentComplexType.clear();
+    if (!spareContent.empty()) {
+        currentComplexType.content = std::move(spareContent.back());
+        spareContent.pop_back();
+    }
+}
 
 void SchemaReader::doComplexType(xercesc::AttributeList& attrs) {
     if (tooDeep())
         return;
-    saveComplexType(currentComplexType, complexTypeStack);
+    saveComplexType();
     complexElementDepths.push_back(elementStack.size());
     typeTarget = &currentComplexType;
     beginTypeDefinition(attrs, currentComplexType);
@@ -63,9 +69,14 @@ void SchemaReader::beginTypeDefinition(xercesc::AttributeList& attrs, SimpleType
 }
 
 // Stores the finished definition and brings back the one it stood in. The model
-// keeps every definition's content for the whole read, so its spare room goes.
+// keeps every definition's content for the whole read: it takes a copy of exactly
+// its size, and the room the content grew in serves the next definition opened.
 void SchemaReader::storeDefinition() {
-    currentComplexType.content.shrink_to_fit();
+    std::vector<ElementDef> built = std::move(currentComplexType.content);
+    currentComplexType.content.assign(std::make_move_iterator(built.begin()),
+                                      std::make_move_iterator(built.end()));
+    built.clear();
+    spareContent.push_back(std::move(built));
     model.complexTypes.push_back(std::move(currentComplexType));
     currentComplexType = std::move(complexTypeStack.back());
     complexTypeStack.pop_back();
@@ -136,7 +147,7 @@ void SchemaReader::doGroup(xercesc::AttributeList& attrs) {
         return;
     if (elementStack.empty() && complexDepth == 0 && simpleDepth == 0)
         nameDefinition(groupName, groupNs, true);
-    saveComplexType(currentComplexType, complexTypeStack);
+    saveComplexType();
     complexElementDepths.push_back(elementStack.size());
     currentComplexType.name = std::move(groupName);
     currentComplexType.nameNs = std::move(groupNs);

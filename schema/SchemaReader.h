@@ -162,6 +162,7 @@ class SchemaReader : public xercesc::HandlerBase {
     void finishElement();
     void doComplexType(xercesc::AttributeList& attrs);
     void beginTypeDefinition(xercesc::AttributeList& attrs, SimpleTypeDef& type);
+    void saveComplexType();
     void storeDefinition();
     void finishComplexType();
     void doExtension(xercesc::AttributeList& attrs);
@@ -272,6 +273,9 @@ class SchemaReader : public xercesc::HandlerBase {
     std::vector<ElementDef> elementStack;
     ComplexTypeDef currentComplexType;
     std::vector<ComplexTypeDef> complexTypeStack;
+    // Emptied content vectors of finished definitions, with their room, for the next
+    // ones opened: no more of them than definitions were ever open at once.
+    std::vector<std::vector<ElementDef>> spareContent;
     int32_t complexDepth = 0;
     SimpleTypeDef currentSimpleType;
     SimpleTypeDef* typeTarget = nullptr;
