@@ -256,9 +256,26 @@ void appendCollapsed(std::basic_string<Char>& text, const XMLCh* chars, const XM
         return c <= u' ' && (c == u' ' || c == u'\t' || c == u'\n' || c == u'\r');
     };
     const size_t kept = text.size();
-    text.resize(kept + size_t(end - chars) + 1);
+    const size_t n = size_t(end - chars);
+    text.resize(kept + n + 1);
     Char* const begin = text.data();
     Char* out = begin + kept;
+    // Most pieces hold words between single blanks and nothing else below a blank:
+    // such a piece is copied whole, by loops the compiler turns into vector code.
+    if (n != 0 && chars[0] != u' ' && chars[n - 1] != u' ') {
+        unsigned char irregular = chars[0] < u' ';
+        for (size_t i = 1; i < n; ++i)
+            irregular |= (chars[i] < u' ') | ((chars[i] == u' ') & (chars[i - 1] == u' '));
+        if (!irregular) {
+            if (blank && out != begin)
+                *out++ = Char(' ');
+            blank = false;
+            for (size_t i = 0; i < n; ++i)
+                out[i] = static_cast<Char>(chars[i]);
+            text.resize(size_t(out + n - begin));
+            return;
+        }
+    }
     while (chars != end) {
         if (isSpace(*chars)) {
             blank = true;

@@ -176,7 +176,7 @@ const DetailCase kCases[] = {
             <b>bold</b> &amp; &#233;t&#233; &#x20AC;&#x1F600;</xs:documentation></xs:annotation></xs:element>
           <xs:element name="byType" type="Code"/>
           <xs:element name="both" type="Code"><xs:annotation>
-            <xs:documentation>Declared</xs:documentation></xs:annotation></xs:element>
+            <xs:documentation>Declared here </xs:documentation></xs:annotation></xs:element>
           <xs:element name="none" type="xs:int"/>
           <xs:element name="party" type="Party"/>
           <xs:element name="blankFirst" type="xs:int"><xs:annotation>
@@ -184,14 +184,14 @@ const DetailCase kCases[] = {
             <xs:documentation>Second</xs:documentation></xs:annotation></xs:element>
           <xs:element ref="global"/>
         </xs:sequence><xs:attribute name="a" type="xs:int"><xs:annotation>
-          <xs:documentation>An attribute</xs:documentation></xs:annotation></xs:attribute>
+          <xs:documentation>An  attribute</xs:documentation></xs:annotation></xs:attribute>
         </xs:complexType></xs:element>)",
      "r(0): own int(48) 0/10/0, byType string(16), both string(16), none int(48) 0/10/0, "
      "party Record(2) notnull, blankFirst int(48) 0/10/0, global int(48) 0/10/0, "
      "a int attribute(304) 0/10/0\n"
      "party(0): name string(16)\n",
      "r(0): own int(48) 0/10/0 \"Own bold & \xc3\xa9t\xc3\xa9 \xe2\x82\xac\xf0\x9f\x98\x80\", "
-     "byType string(16) \"A code of three letters\", both string(16) \"Declared\", "
+     "byType string(16) \"A code of three letters\", both string(16) \"Declared here\", "
      "none int(48) 0/10/0, party Record(2) notnull \"Someone\", "
      "blankFirst int(48) 0/10/0 \"Second\", global int(48) 0/10/0 \"Global\", "
      "a int attribute(304) 0/10/0 \"An attribute\"\n"
