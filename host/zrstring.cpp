@@ -16,6 +16,12 @@ void appendCodePoint(std::u16string& out, char32_t cp) {
     }
 }
 
+// Whether a high surrogate at `i` is followed by its low partner.
+bool pairAt(std::u16string_view text, size_t i) {
+    return text[i] >= 0xD800 && text[i] <= 0xDBFF && i + 1 < text.size() && text[i + 1] >= 0xDC00 &&
+           text[i + 1] <= 0xDFFF;
+}
+
 // Byte count of a narrow text given with an optional length, never reading past a
 // terminator.
 size_t narrowLength(const char* text, long len) {
@@ -132,8 +138,7 @@ void zrAppendUtf8(std::string& out, std::u16string_view text) {
             bytes += 1;
         } else if (u < 0x800) {
             bytes += 2;
-        } else if (u >= 0xD800 && u <= 0xDBFF && i + 1 < n && text[i + 1] >= 0xDC00 &&
-                   text[i + 1] <= 0xDFFF) {
+        } else if (pairAt(text, i)) {
             bytes += 4;
             ++i;
         } else {
@@ -149,8 +154,7 @@ void zrAppendUtf8(std::string& out, std::u16string_view text) {
             *p++ = static_cast<char>(c);
             continue;
         }
-        if (c >= 0xD800 && c <= 0xDBFF && i + 1 < n && text[i + 1] >= 0xDC00 &&
-            text[i + 1] <= 0xDFFF)
+        if (pairAt(text, i))
             c = 0x10000 + ((c - 0xD800) << 10) + (static_cast<char32_t>(text[++i]) - 0xDC00);
         else if (c >= 0xD800 && c <= 0xDFFF)
             c = kReplacement;

@@ -17,10 +17,12 @@ void nameIfAnonymous(ZrName& name, int32_t& anonCount) {
 
 } // namespace
 
-// Saves the working complex type on the stack and leaves it cleared; the content
-// moves, and the new definition's content grows in room a finished one gave back.
+// Saves the working complex type, and how many declarations were open around it, on
+// the stacks and leaves it cleared; the content moves, and the new definition's
+// content grows in room a finished one gave back.
 void SchemaReader::saveComplexType() {
     complexTypeStack.push_back(std::move(currentComplexType));
+    complexElementDepths.push_back(elementStack.size());
     currentComplexType.clear();
     if (!spareContent.empty()) {
         currentComplexType.content = std::move(spareContent.back());
@@ -32,7 +34,6 @@ void SchemaReader::doComplexType(xercesc::AttributeList& attrs) {
     if (tooDeep())
         return;
     saveComplexType();
-    complexElementDepths.push_back(elementStack.size());
     typeTarget = &currentComplexType;
     beginTypeDefinition(attrs, currentComplexType);
     ++complexDepth;
@@ -148,7 +149,6 @@ void SchemaReader::doGroup(xercesc::AttributeList& attrs) {
     if (elementStack.empty() && complexDepth == 0 && simpleDepth == 0)
         nameDefinition(groupName, groupNs, true);
     saveComplexType();
-    complexElementDepths.push_back(elementStack.size());
     currentComplexType.name = std::move(groupName);
     currentComplexType.nameNs = std::move(groupNs);
     currentComplexType.isGroup = true;

@@ -252,9 +252,6 @@ namespace {
 template <class Char>
 void appendCollapsed(std::basic_string<Char>& text, const XMLCh* chars, const XMLCh* end,
                      bool& blank) {
-    const auto isSpace = [](char16_t c) {
-        return c <= u' ' && (c == u' ' || c == u'\t' || c == u'\n' || c == u'\r');
-    };
     const size_t kept = text.size();
     const size_t n = size_t(end - chars);
     text.resize(kept + n + 1);
@@ -277,7 +274,7 @@ void appendCollapsed(std::basic_string<Char>& text, const XMLCh* chars, const XM
         }
     }
     while (chars != end) {
-        if (isSpace(*chars)) {
+        if (isXmlSpace(*chars)) {
             blank = true;
             ++chars;
             continue;
@@ -287,7 +284,7 @@ void appendCollapsed(std::basic_string<Char>& text, const XMLCh* chars, const XM
         blank = false;
         do
             *out++ = static_cast<Char>(*chars++);
-        while (chars != end && !isSpace(*chars));
+        while (chars != end && !isXmlSpace(*chars));
     }
     text.resize(size_t(out - begin));
 }

@@ -5,12 +5,6 @@
 #include <string>
 #include <string_view>
 
-namespace {
-
-bool isXmlSpace(char16_t c) { return c == u' ' || c == u'\t' || c == u'\n' || c == u'\r'; }
-
-} // namespace
-
 // A simple type inside another's restriction, list or union is a type of its own;
 // the outer one waits on the stack until the inner one ends.
 void SchemaReader::doSimpleType(xercesc::AttributeList& attrs) {
